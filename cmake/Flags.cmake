@@ -1,0 +1,54 @@
+# Compiler flags of our own code, in one place.
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_C_STANDARD 11)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_C_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+
+find_program(KYV_CCACHE ccache)
+if(KYV_CCACHE)
+    set(CMAKE_CXX_COMPILER_LAUNCHER ${KYV_CCACHE})
+    set(CMAKE_C_COMPILER_LAUNCHER ${KYV_CCACHE})
+endif()
+
+# Directory-wide, so that the test frame built from source is instrumented like our code.
+if(KYV_SANITIZE)
+    add_compile_options(-fsanitize=${KYV_SANITIZE} -fno-omit-frame-pointer
+                        -fno-sanitize-recover=all)
+    add_link_options(-fsanitize=${KYV_SANITIZE})
+endif()
+if(WIN32)
+    # The product needs nothing but system libraries.
+    add_link_options(-static)
+endif()
+
+# Pixels must have the same bytes on both targets: no contraction into fused operations.
+function(kyv_target target)
+    target_compile_options(${target} PRIVATE -Wall -Wextra -Wshadow -Werror -ffp-contract=off)
+    target_include_directories(${target} PRIVATE ${PROJECT_SOURCE_DIR})
+    if(WIN32)
+        # No NOMINMAX surprises, wide entry points only.
+        target_compile_definitions(${target} PRIVATE UNICODE _UNICODE NOMINMAX WIN32_LEAN_AND_MEAN)
+    endif()
+endfunction()
+
+# Adds sources to a target. The suffix of a kernel file alone gives it its instruction set, and
+# files of a form that is switched off are left out.
+function(kyv_sources target)
+    foreach(source IN LISTS ARGN)
+        if(source MATCHES "_(sse2|ssse3|avx2)\\.cpp$")
+            if(NOT KYV_VECTOR_KERNELS)
+                continue()
+            endif()
+            if(NOT CMAKE_MATCH_1 STREQUAL "sse2")
+                set_source_files_properties(${source} TARGET_DIRECTORY ${target}
+                                            PROPERTIES COMPILE_OPTIONS -m${CMAKE_MATCH_1})
+            endif()
+        endif()
+        target_sources(${target} PRIVATE ${CMAKE_CURRENT_SOURCE_DIR}/${source})
+    endforeach()
+endfunction()

@@ -1,0 +1,34 @@
+// Colour temperature: shifts the picture between cool and warm and between green and magenta.
+//
+//   "P1"  float   -1 cool .. 1 warm
+//   "P2"  int     comparison: 0 off, other values leave the left half unprocessed; 2 shows the
+//                 centre half of the picture twice, before and after (hosts set it although the
+//                 parameter is declared a boolean)
+//   "P3"  float   -1 green .. 1 magenta
+#pragma once
+
+#include "effects/color/ColorTemperatureRow.h"
+#include "module/HostInterface.h"
+
+namespace kyv {
+
+struct ColorTemperature {
+    struct Instance {
+        void* input;
+        void* output;
+        ColorTables temperature;
+        float temperatureDegree; // the value the tables were built for
+        uint32_t* comparison;    // owned: a frame with the picture's centre half twice
+        uint32_t comparisonPixels;
+        ColorTables tint;
+        float tintDegree;
+    };
+    static_assert(sizeof(Instance) == 6184);
+
+    static constexpr uint32_t kInputCount = 1;
+    static void Begin(EffectContext& context, Instance& instance);
+    static KyvStatus Process(EffectContext& context, Instance& instance);
+    static void Release(EffectContext& context, Instance& instance);
+};
+
+} // namespace kyv

@@ -1,0 +1,32 @@
+// Where the pixels of a call lie in the host's frames.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+#include "module/HostInterface.h"
+
+namespace kyv {
+
+// Frames are 4 bytes a pixel. A side-by-side frame has rows of two views.
+struct FrameGeometry {
+    int32_t width;          // pixels of the view that this call treats
+    int32_t height;         // rows
+    int32_t pitchBytes;     // from row to row of the frame
+    int32_t viewOffset;     // bytes from a row's start to the view's first pixel
+    uint32_t layout;        // a StereoLayout; unknown values count as Mono
+    size_t frameBytes;      // the whole frame, both views
+};
+
+// The largest side of a frame, in pixels. Beyond it a size is nonsense, and the arithmetic of
+// pitches and positions has room below it.
+inline constexpr uint32_t kMaxFrameSide = 1u << 20;
+
+// False when the context's width or height is 0 or beyond kMaxFrameSide.
+bool GetFrameGeometry(const EffectContext& context, FrameGeometry& geometry);
+
+// Copies the view of the call from one frame to another of the same geometry. The frames may be
+// one and the same, but must not overlap otherwise.
+void CopyView(const FrameGeometry& geometry, void* output, const void* input);
+
+} // namespace kyv

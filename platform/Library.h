@@ -1,0 +1,38 @@
+// Loadable libraries: this module's own file, others beside it, and the user's language.
+#pragma once
+
+#include <filesystem>
+#include <string>
+
+namespace kyv {
+
+// An HMODULE on Windows, a dlopen handle on Linux. Null means none.
+using LibraryHandle = void*;
+
+// A path in the system's own encoding: UTF-16 on Windows, bytes on Linux.
+using NativeString = std::filesystem::path::string_type;
+
+// Room for a path or a path's candidate, with its terminating zero.
+inline constexpr size_t kMaxPathUnits = 260;
+
+// The full path, without "." or ".." parts, of a loaded library; at most kMaxPathUnits - 1 units,
+// cut off beyond. Empty when the handle is unknown.
+NativeString LibraryFileName(LibraryHandle library);
+
+// Three letters such as ENU, DEU or JPN for the user's language and country. On Linux it is taken
+// from LC_ALL, LC_MESSAGES or LANG, whichever is set first; ENU when none is, or for "C".
+NativeString AbbreviatedLanguageName();
+
+// True for anything that has attributes, a folder included.
+bool FileExists(const NativeString& path);
+
+// Null when the library cannot be loaded.
+LibraryHandle OpenLibrary(const NativeString& path);
+
+// Null is allowed and does nothing.
+void CloseLibrary(LibraryHandle library);
+
+// Null when the library has no such export.
+void* FindSymbol(LibraryHandle library, const char* name);
+
+} // namespace kyv

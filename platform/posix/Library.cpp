@@ -1,0 +1,104 @@
+// Loadable libraries on Linux.
+#include "platform/Library.h"
+
+#include <array>
+#include <cstdlib>
+#include <string_view>
+
+#include <dlfcn.h>
+#include <link.h>
+#include <sys/stat.h>
+
+namespace kyv {
+namespace {
+
+struct LanguageName {
+    std::string_view locale; // language_COUNTRY, or a language alone as its default country
+    const char* abbreviation;
+};
+
+// The names that Windows gives to its locales. The entry without a country serves every country
+// that is not listed.
+constexpr LanguageName kLanguageNames[] = {
+    {"ar", "ARA"},    {"bg", "BGR"},    {"ca", "CAT"},    {"cs", "CSY"},    {"da", "DAN"},
+    {"de", "DEU"},    {"de_AT", "DEA"}, {"de_CH", "DES"}, {"de_LI", "DEC"}, {"de_LU", "DEL"},
+    {"el", "ELL"},    {"en", "ENU"},    {"en_AU", "ENA"}, {"en_CA", "ENC"}, {"en_GB", "ENG"},
+    {"en_IE", "ENI"}, {"en_NZ", "ENZ"}, {"en_ZA", "ENS"}, {"es", "ESN"},    {"es_AR", "ESS"},
+    {"es_CL", "ESL"}, {"es_CO", "ESO"}, {"es_MX", "ESM"}, {"et", "ETI"},    {"eu", "EUQ"},
+    {"fa", "FAR"},    {"fi", "FIN"},    {"fr", "FRA"},    {"fr_BE", "FRB"}, {"fr_CA", "FRC"},
+    {"fr_CH", "FRS"}, {"fr_LU", "FRL"}, {"gl", "GLC"},    {"he", "HEB"},    {"hi", "HIN"},
+    {"hr", "HRV"},    {"hu", "HUN"},    {"id", "IND"},    {"is", "ISL"},    {"it", "ITA"},
+    {"it_CH", "ITS"}, {"ja", "JPN"},    {"ko", "KOR"},    {"lt", "LTH"},    {"lv", "LVI"},
+    {"ms", "MSL"},    {"nb", "NOR"},    {"nl", "NLD"},    {"nl_BE", "NLB"}, {"nn", "NON"},
+    {"no", "NOR"},    {"pl", "PLK"},    {"pt", "PTG"},    {"pt_BR", "PTB"}, {"ro", "ROM"},
+    {"ru", "RUS"},    {"sk", "SKY"},    {"sl", "SLV"},    {"sv", "SVE"},    {"sv_FI", "SVF"},
+    {"th", "THA"},    {"tr", "TRK"},    {"uk", "UKR"},    {"vi", "VIT"},    {"zh", "CHS"},
+    {"zh_HK", "ZHH"}, {"zh_MO", "ZHM"}, {"zh_SG", "ZHI"}, {"zh_TW", "CHT"},
+};
+
+const char* Lookup(std::string_view locale) {
+    for (const LanguageName& entry : kLanguageNames) {
+        if (entry.locale == locale) {
+            return entry.abbreviation;
+        }
+    }
+    return nullptr;
+}
+
+std::string_view UserLocale() {
+    for (const char* variable : {"LC_ALL", "LC_MESSAGES", "LANG"}) {
+        const char* value = std::getenv(variable);
+        if (value && *value) {
+            return value;
+        }
+    }
+    return {};
+}
+
+} // namespace
+
+NativeString LibraryFileName(LibraryHandle library) {
+    const link_map* map = nullptr;
+    if (!library || dlinfo(library, RTLD_DI_LINKMAP, &map) != 0 || !map->l_name) {
+        return {};
+    }
+    // The name is as the loader was given it. One that is relative holds for the working folder
+    // at that time, which is as good as ours unless the host has moved meanwhile.
+    std::error_code error;
+    NativeString path = std::filesystem::absolute(map->l_name, error).lexically_normal().native();
+    if (path.size() >= kMaxPathUnits) {
+        path.resize(kMaxPathUnits - 1);
+    }
+    return path;
+}
+
+NativeString AbbreviatedLanguageName() {
+    std::string_view locale = UserLocale();
+    locale = locale.substr(0, locale.find_first_of(".@")); // codeset and modifier
+    const char* name = Lookup(locale);
+    if (!name) {
+        name = Lookup(locale.substr(0, locale.find('_')));
+    }
+    return name ? name : "ENU";
+}
+
+bool FileExists(const NativeString& path) {
+    struct stat attributes;
+    return stat(path.c_str(), &attributes) == 0;
+}
+
+LibraryHandle OpenLibrary(const NativeString& path) {
+    return dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
+}
+
+void CloseLibrary(LibraryHandle library) {
+    if (library) {
+        dlclose(library);
+    }
+}
+
+void* FindSymbol(LibraryHandle library, const char* name) {
+    return library ? dlsym(library, name) : nullptr;
+}
+
+} // namespace kyv

@@ -1,0 +1,33 @@
+// Loadable libraries on Windows.
+#include "platform/Library.h"
+
+#include <windows.h>
+
+namespace kyv {
+
+NativeString LibraryFileName(LibraryHandle library) {
+    wchar_t path[kMaxPathUnits];
+    const DWORD length =
+        GetModuleFileNameW(static_cast<HMODULE>(library), path, DWORD{kMaxPathUnits});
+    return NativeString(path, length < kMaxPathUnits ? length : kMaxPathUnits - 1);
+}
+
+NativeString AbbreviatedLanguageName() {
+    wchar_t name[8];
+    const int length = GetLocaleInfoW(LOCALE_USER_DEFAULT, LOCALE_SABBREVLANGNAME, name, 8);
+    return length > 0 ? NativeString(name) : NativeString(L"ENU");
+}
+
+bool FileExists(const NativeString& path) {
+    return GetFileAttributesW(path.c_str()) != INVALID_FILE_ATTRIBUTES;
+}
+
+LibraryHandle OpenLibrary(const NativeString& path) { return LoadLibraryW(path.c_str()); }
+
+void CloseLibrary(LibraryHandle library) { FreeLibrary(static_cast<HMODULE>(library)); }
+
+void* FindSymbol(LibraryHandle library, const char* name) {
+    return reinterpret_cast<void*>(GetProcAddress(static_cast<HMODULE>(library), name));
+}
+
+} // namespace kyv
