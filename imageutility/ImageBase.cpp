@@ -39,7 +39,9 @@ CImageBase::CImageBase(const CImageBase& other, uint32_t* result)
     }
 }
 
-CImageBase::~CImageBase() { Release(); }
+CImageBase::~CImageBase() {
+    Release();
+}
 
 // The constructors' allocation: failure leaves a null buffer.
 void CImageBase::Allocate(uint32_t* result) {
@@ -61,12 +63,13 @@ void CImageBase::Release() {
     m_pBuffer = nullptr;
 }
 
-int32_t CImageBase::GetPixelCount() const { return kyv::WrapMul(m_nWidth, m_nHeight); }
+int32_t CImageBase::GetPixelCount() const {
+    return kyv::WrapMul(m_nWidth, m_nHeight);
+}
 
 uint8_t* CImageBase::GetPixelAddress(uint32_t x, uint32_t y) const {
-    const int32_t offset =
-        kyv::WrapAdd(kyv::WrapMul(static_cast<int32_t>(y), m_nPitch),
-                     kyv::WrapMul(static_cast<int32_t>(x), m_nBytesPerPixel));
+    const int32_t offset = kyv::WrapAdd(kyv::WrapMul(static_cast<int32_t>(y), m_nPitch),
+                                        kyv::WrapMul(static_cast<int32_t>(x), m_nBytesPerPixel));
     return reinterpret_cast<uint8_t*>(reinterpret_cast<intptr_t>(m_pBuffer) + offset);
 }
 
@@ -142,8 +145,10 @@ int32_t CImageBase::MakeView(CImageBase& view, int32_t x, int32_t y, int32_t w, 
         left = std::max(x, 0);
         top = std::max(y, 0);
         // A negative w or h makes an empty view, never one of negative size.
-        width = static_cast<int32_t>(std::max<int64_t>(std::min<int64_t>(m_nWidth, right) - left, 0));
-        height = static_cast<int32_t>(std::max<int64_t>(std::min<int64_t>(m_nHeight, bottom) - top, 0));
+        width =
+            static_cast<int32_t>(std::max<int64_t>(std::min<int64_t>(m_nWidth, right) - left, 0));
+        height =
+            static_cast<int32_t>(std::max<int64_t>(std::min<int64_t>(m_nHeight, bottom) - top, 0));
     }
     view.m_pBuffer = Row(top) + static_cast<ptrdiff_t>(left) * m_nBytesPerPixel;
     view.m_nWidth = width;

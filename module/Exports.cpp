@@ -9,7 +9,8 @@ extern "C" {
 
 // A library that an earlier call loaded stays in use when this search finds none, and is not
 // released when it finds one: the load count belongs to whoever called twice.
-[[gnu::visibility("default")]] KyvStatus KYV_DSP_InitModule(ModuleDescriptor** descriptor) noexcept {
+[[gnu::visibility("default")]] KyvStatus
+KYV_DSP_InitModule(ModuleDescriptor** descriptor) noexcept {
     if (!descriptor) {
         return KYV_FAIL;
     }

@@ -10,12 +10,12 @@ namespace kyv {
 
 // Frames are 4 bytes a pixel. A side-by-side frame has rows of two views.
 struct FrameGeometry {
-    int32_t width;          // pixels of the view that this call treats
-    int32_t height;         // rows
-    int32_t pitchBytes;     // from row to row of the frame
-    int32_t viewOffset;     // bytes from a row's start to the view's first pixel
-    uint32_t layout;        // a StereoLayout; unknown values count as Mono
-    size_t frameBytes;      // the whole frame, both views
+    int32_t width;      // pixels of the view that this call treats
+    int32_t height;     // rows
+    int32_t pitchBytes; // from row to row of the frame
+    int32_t viewOffset; // bytes from a row's start to the view's first pixel
+    uint32_t layout;    // a StereoLayout; unknown values count as Mono
+    size_t frameBytes;  // the whole frame, both views
 };
 
 // The largest side of a frame, in pixels. Beyond it a size is nonsense, and the arithmetic of

@@ -83,10 +83,10 @@ enum ParamType {
 // ParamDescriptor::control, the editing control that suits the parameter.
 enum ParamControl {
     ParamControl_Slider = 2,
-    ParamControl_ColorButton = 4,  // border and shadow colours
-    ParamControl_ColorPicker = 5,  // colour key, transition colour, white reference
+    ParamControl_ColorButton = 4, // border and shadow colours
+    ParamControl_ColorPicker = 5, // colour key, transition colour, white reference
     ParamControl_CheckBox = 6,
-    ParamControl_ChoiceList = 9,   // the labels follow the name key, separated by ";"
+    ParamControl_ChoiceList = 9, // the labels follow the name key, separated by ";"
     ParamControl_MaskRect = 10,
     ParamControl_Position = 11,
     ParamControl_DepthSlider = 12, // signed three-dimensional depth, -1 to 1
@@ -94,25 +94,25 @@ enum ParamControl {
 
 // One parameter of an effect. The value pointers each lead to a static value of valueSize bytes.
 struct ParamDescriptor {
-    const char* key;         // 0x00  "P0", "P1", ...
-    const char* nameKey;     // 0x08  a choice list appends its labels: "KEY;first;second"
-    const char* descKey;     // 0x10  a key, the text "none", or null
-    const void* minimum;     // 0x18
-    const void* maximum;     // 0x20  equal to minimum where the type itself is the range
+    const char* key;          // 0x00  "P0", "P1", ...
+    const char* nameKey;      // 0x08  a choice list appends its labels: "KEY;first;second"
+    const char* descKey;      // 0x10  a key, the text "none", or null
+    const void* minimum;      // 0x18
+    const void* maximum;      // 0x20  equal to minimum where the type itself is the range
     const void* defaultValue; // 0x28  what InitInstance writes
-    const void* value4;      // 0x30  host-interpreted, as are 5 and 6
-    const void* value5;      // 0x38
-    const void* value6;      // 0x40
-    uint64_t reserved48;     // 0x48  zero
-    uint32_t reserved50;     // 0x50  zero
-    uint32_t type;           // 0x54  enum ParamType
-    uint32_t control;        // 0x58  enum ParamControl
-    uint32_t valueSize;      // 0x5c  bytes of one value: 1, 4, 8 or 16
-    uint32_t flag;           // 0x60  0 or 1, host-interpreted
-    uint32_t reserved64;     // 0x64  zero
-    uint64_t reserved68;     // 0x68  zero
-    uint32_t group;          // 0x70  group number, host-interpreted
-    uint32_t reserved74;     // 0x74  zero
+    const void* value4;       // 0x30  host-interpreted, as are 5 and 6
+    const void* value5;       // 0x38
+    const void* value6;       // 0x40
+    uint64_t reserved48;      // 0x48  zero
+    uint32_t reserved50;      // 0x50  zero
+    uint32_t type;            // 0x54  enum ParamType
+    uint32_t control;         // 0x58  enum ParamControl
+    uint32_t valueSize;       // 0x5c  bytes of one value: 1, 4, 8 or 16
+    uint32_t flag;            // 0x60  0 or 1, host-interpreted
+    uint32_t reserved64;      // 0x64  zero
+    uint64_t reserved68;      // 0x68  zero
+    uint32_t group;           // 0x70  group number, host-interpreted
+    uint32_t reserved74;      // 0x74  zero
 };
 
 // ------------------------------------------------------------------------------------ callbacks
@@ -144,9 +144,9 @@ typedef struct EffectCallbacks {
 
 // Bits of EffectProperties::capabilities.
 enum EffectCapability {
-    EffectCapability_Frames = 0x001,      // renders frames in memory: every effect
-    EffectCapability_GpuHelper = 0x414,   // can render through the host's GPU helper library
-    EffectCapability_WorkerPool = 0x100,  // the light ray
+    EffectCapability_Frames = 0x001,     // renders frames in memory: every effect
+    EffectCapability_GpuHelper = 0x414,  // can render through the host's GPU helper library
+    EffectCapability_WorkerPool = 0x100, // the light ray
 };
 
 // Declarations for the host; no callback reads them. Fields without a settled meaning keep their
@@ -173,34 +173,34 @@ typedef struct EffectProperties {
 } EffectProperties;
 
 struct EffectDescriptor {
-    const char* identifier;          // 0x00  unique; what a host stores in its projects
+    const char* identifier;         // 0x00  unique; what a host stores in its projects
+    const char* nameKey;            // 0x08
+    const char* descKey;            // 0x10
+    const char* author;             // 0x18
+    const char* vendor;             // 0x20
+    EffectProperties properties;    // 0x28
+    uint32_t paramCount;            // 0x6c
+    const ParamDescriptor* params;  // 0x70  paramCount records
+    const ModuleDescriptor* module; // 0x78  back to the module
+    uint32_t instanceDataSize;      // 0x80  bytes of EffectContext::instanceData
+    uint32_t reserved84;            // 0x84
+    EffectCallbacks callbacks;      // 0x88
+    const char* subclass;           // 0xd0  the host's category of the effect
+};
+
+struct ModuleDescriptor {
+    uint32_t formatNumber;           // 0x00  kKyvFormatNumber
+    uint32_t reserved04;             // 0x04
     const char* nameKey;             // 0x08
     const char* descKey;             // 0x10
     const char* author;              // 0x18
     const char* vendor;              // 0x20
-    EffectProperties properties;     // 0x28
-    uint32_t paramCount;             // 0x6c
-    const ParamDescriptor* params;   // 0x70  paramCount records
-    const ModuleDescriptor* module;  // 0x78  back to the module
-    uint32_t instanceDataSize;       // 0x80  bytes of EffectContext::instanceData
-    uint32_t reserved84;             // 0x84
-    EffectCallbacks callbacks;       // 0x88
-    const char* subclass;            // 0xd0  the host's category of the effect
-};
-
-struct ModuleDescriptor {
-    uint32_t formatNumber;            // 0x00  kKyvFormatNumber
-    uint32_t reserved04;              // 0x04
-    const char* nameKey;              // 0x08
-    const char* descKey;              // 0x10
-    const char* author;               // 0x18
-    const char* vendor;               // 0x20
-    KyvModuleHandle ModuleHandle;     // 0x28  this library, set when it is loaded
-    KyvModuleHandle ResourceLibrary;  // 0x30  the language library, or ModuleHandle when there is
-                                      //       none; null outside InitModule .. DeInitModule
-    uint32_t effectCount;             // 0x38  12
-    uint32_t reserved3c;              // 0x3c
-    const EffectDescriptor* effects;  // 0x40  effectCount records
+    KyvModuleHandle ModuleHandle;    // 0x28  this library, set when it is loaded
+    KyvModuleHandle ResourceLibrary; // 0x30  the language library, or ModuleHandle when there is
+                                     //       none; null outside InitModule .. DeInitModule
+    uint32_t effectCount;            // 0x38  12
+    uint32_t reserved3c;             // 0x3c
+    const EffectDescriptor* effects; // 0x40  effectCount records
 };
 
 // -------------------------------------------------------------------------------------- context
@@ -230,7 +230,7 @@ enum GpuMode {
     GpuMode_Processor = 1,
     GpuMode_CudartA = 2, // through the object from "GetCudartWrapper"
     GpuMode_CudartB = 4,
-    GpuMode_BrookA = 8,  // through the object from "GetBrookWrapper"
+    GpuMode_BrookA = 8, // through the object from "GetBrookWrapper"
     GpuMode_BrookB = 16,
     GpuMode_DeviceA = 512, // through EffectContext::gpuDevice
     GpuMode_DeviceB = 1024,
@@ -240,7 +240,7 @@ enum GpuMode {
 // within it, and every level gives the same bytes.
 enum CpuLevel {
     CpuLevel_Scalar = 0,
-    CpuLevel_Mmx = 1,   // 1 and 2
+    CpuLevel_Mmx = 1, // 1 and 2
     CpuLevel_Sse2 = 3,
     CpuLevel_Ssse3 = 4, // 4 and above: SSSE3, and AVX2 where the processor has it
     CpuLevel_Avx2 = 5,
@@ -259,43 +259,43 @@ struct HostNotification {
 // One per instance, owned and filled in by the host. Times are in units of 100 ns. The module
 // writes only requestA, requestB, gpuMode (when a GPU render fails) and what the pointers lead to.
 struct EffectContext {
-    uint64_t reserved00;                 // 0x00
-    const EffectDescriptor* descriptor;  // 0x08
-    HostNotification* notification;      // 0x10  notified by InitInstance; may be null
-    uint64_t reserved18;                 // 0x18
-    void* instanceData;                  // 0x20  instanceDataSize bytes, zero-filled by the host
-    void* frame;                         // 0x28  input in SetInputFrame, output in ProcessFrame
-    uint32_t pixelFormat;                // 0x30  enum PixelFormat
-    uint32_t reserved34;                 // 0x34
-    uint32_t fieldSelector;              // 0x38  enum FieldSelector
-    uint32_t gpuMode;                    // 0x3c  enum GpuMode; the style effects
-    uint32_t reserved40;                 // 0x40
-    uint32_t stereoLayout;               // 0x44  enum StereoLayout
-    uint64_t reserved48;                 // 0x48
-    KyvModuleHandle gpuLibrary;          // 0x50  GPU helper library, or null
-    uint64_t reserved58[2];              // 0x58
-    void* gpuDevice;                     // 0x68  handed to the GPU helper
-    uint32_t reserved70;                 // 0x70
-    uint32_t width;                      // 0x74  pixels of one view
-    uint32_t height;                     // 0x78  rows
-    uint32_t reserved7c[5];              // 0x7c
-    void* params;                        // 0x90  current values, packed in table order
-    uint64_t reserved98[3];              // 0x98
-    uint32_t displayAspectX;             // 0xb0  0: the width
-    uint32_t displayAspectY;             // 0xb4  0: the height
-    int64_t position;                    // 0xb8  100 ns units
-    int64_t duration;                    // 0xc0  100 ns units
-    uint32_t preview;                    // 0xc8  non-zero: take the moment previewFraction names
-    float previewFraction;               // 0xcc  0 to 1
-    uint32_t threadCount;                // 0xd0  threads granted to the instance
-    uint32_t reservedD4[3];              // 0xd4
-    uint32_t requestA;                   // 0xe0  set to 1 by some effects' BeginProcessing
-    uint32_t reservedE4[8];              // 0xe4
-    int32_t cpuLevel;                    // 0x104 enum CpuLevel
-    uint32_t reserved108;                // 0x108
-    uint32_t randomSeed;                 // 0x10c read by the pencil sketch's BeginProcessing
-    uint32_t requestB;                   // 0x110 set to 1 by some effects' BeginProcessing
-    uint32_t reserved114;                // 0x114
+    uint64_t reserved00;                // 0x00
+    const EffectDescriptor* descriptor; // 0x08
+    HostNotification* notification;     // 0x10  notified by InitInstance; may be null
+    uint64_t reserved18;                // 0x18
+    void* instanceData;                 // 0x20  instanceDataSize bytes, zero-filled by the host
+    void* frame;                        // 0x28  input in SetInputFrame, output in ProcessFrame
+    uint32_t pixelFormat;               // 0x30  enum PixelFormat
+    uint32_t reserved34;                // 0x34
+    uint32_t fieldSelector;             // 0x38  enum FieldSelector
+    uint32_t gpuMode;                   // 0x3c  enum GpuMode; the style effects
+    uint32_t reserved40;                // 0x40
+    uint32_t stereoLayout;              // 0x44  enum StereoLayout
+    uint64_t reserved48;                // 0x48
+    KyvModuleHandle gpuLibrary;         // 0x50  GPU helper library, or null
+    uint64_t reserved58[2];             // 0x58
+    void* gpuDevice;                    // 0x68  handed to the GPU helper
+    uint32_t reserved70;                // 0x70
+    uint32_t width;                     // 0x74  pixels of one view
+    uint32_t height;                    // 0x78  rows
+    uint32_t reserved7c[5];             // 0x7c
+    void* params;                       // 0x90  current values, packed in table order
+    uint64_t reserved98[3];             // 0x98
+    uint32_t displayAspectX;            // 0xb0  0: the width
+    uint32_t displayAspectY;            // 0xb4  0: the height
+    int64_t position;                   // 0xb8  100 ns units
+    int64_t duration;                   // 0xc0  100 ns units
+    uint32_t preview;                   // 0xc8  non-zero: take the moment previewFraction names
+    float previewFraction;              // 0xcc  0 to 1
+    uint32_t threadCount;               // 0xd0  threads granted to the instance
+    uint32_t reservedD4[3];             // 0xd4
+    uint32_t requestA;                  // 0xe0  set to 1 by some effects' BeginProcessing
+    uint32_t reservedE4[8];             // 0xe4
+    int32_t cpuLevel;                   // 0x104 enum CpuLevel
+    uint32_t reserved108;               // 0x108
+    uint32_t randomSeed;                // 0x10c read by the pencil sketch's BeginProcessing
+    uint32_t requestB;                  // 0x110 set to 1 by some effects' BeginProcessing
+    uint32_t reserved114;               // 0x114
 };
 
 // -------------------------------------------------------------------------------------- exports

@@ -26,6 +26,8 @@ constinit ModuleDescriptor g_module = {
     .effects = kEffects,
 };
 
-void OnLibraryAttach(LibraryHandle self) { g_module.ModuleHandle = self; }
+void OnLibraryAttach(LibraryHandle self) {
+    g_module.ModuleHandle = self;
+}
 
 } // namespace kyv

@@ -285,17 +285,29 @@ struct Table {
 
 } // namespace
 
-constinit const ParamTable<std::size(kRefractiveBubbleRows)> kRefractiveBubbleParams = Table<kRefractiveBubbleRows>::MakeRecords();
-constinit const ParamTable<std::size(kWaterRippleRows)> kWaterRippleParams = Table<kWaterRippleRows>::MakeRecords();
-constinit const ParamTable<std::size(kBubbleRows)> kBubbleParams = Table<kBubbleRows>::MakeRecords();
-constinit const ParamTable<std::size(kFireworksRows)> kFireworksParams = Table<kFireworksRows>::MakeRecords();
-constinit const ParamTable<std::size(kFreeformRows)> kFreeformParams = Table<kFreeformRows>::MakeRecords();
-constinit const ParamTable<std::size(kTestAlphaRows)> kTestAlphaParams = Table<kTestAlphaRows>::MakeRecords();
-constinit const ParamTable<std::size(kAlphaTransitionRows)> kAlphaTransitionParams = Table<kAlphaTransitionRows>::MakeRecords();
-constinit const ParamTable<std::size(kDreamyRows)> kDreamyParams = Table<kDreamyRows>::MakeRecords();
-constinit const ParamTable<std::size(kLightRayRows)> kLightRayParams = Table<kLightRayRows>::MakeRecords();
-constinit const ParamTable<std::size(kPencilSketchRows)> kPencilSketchParams = Table<kPencilSketchRows>::MakeRecords();
-constinit const ParamTable<std::size(kColorTemperatureRows)> kColorTemperatureParams = Table<kColorTemperatureRows>::MakeRecords();
-constinit const ParamTable<std::size(kWhiteBalanceRows)> kWhiteBalanceParams = Table<kWhiteBalanceRows>::MakeRecords();
+constinit const ParamTable<std::size(kRefractiveBubbleRows)> kRefractiveBubbleParams =
+    Table<kRefractiveBubbleRows>::MakeRecords();
+constinit const ParamTable<std::size(kWaterRippleRows)> kWaterRippleParams =
+    Table<kWaterRippleRows>::MakeRecords();
+constinit const ParamTable<std::size(kBubbleRows)> kBubbleParams =
+    Table<kBubbleRows>::MakeRecords();
+constinit const ParamTable<std::size(kFireworksRows)> kFireworksParams =
+    Table<kFireworksRows>::MakeRecords();
+constinit const ParamTable<std::size(kFreeformRows)> kFreeformParams =
+    Table<kFreeformRows>::MakeRecords();
+constinit const ParamTable<std::size(kTestAlphaRows)> kTestAlphaParams =
+    Table<kTestAlphaRows>::MakeRecords();
+constinit const ParamTable<std::size(kAlphaTransitionRows)> kAlphaTransitionParams =
+    Table<kAlphaTransitionRows>::MakeRecords();
+constinit const ParamTable<std::size(kDreamyRows)> kDreamyParams =
+    Table<kDreamyRows>::MakeRecords();
+constinit const ParamTable<std::size(kLightRayRows)> kLightRayParams =
+    Table<kLightRayRows>::MakeRecords();
+constinit const ParamTable<std::size(kPencilSketchRows)> kPencilSketchParams =
+    Table<kPencilSketchRows>::MakeRecords();
+constinit const ParamTable<std::size(kColorTemperatureRows)> kColorTemperatureParams =
+    Table<kColorTemperatureRows>::MakeRecords();
+constinit const ParamTable<std::size(kWhiteBalanceRows)> kWhiteBalanceParams =
+    Table<kWhiteBalanceRows>::MakeRecords();
 
 } // namespace kyv

@@ -22,9 +22,13 @@ bool FileExists(const NativeString& path) {
     return GetFileAttributesW(path.c_str()) != INVALID_FILE_ATTRIBUTES;
 }
 
-LibraryHandle OpenLibrary(const NativeString& path) { return LoadLibraryW(path.c_str()); }
+LibraryHandle OpenLibrary(const NativeString& path) {
+    return LoadLibraryW(path.c_str());
+}
 
-void CloseLibrary(LibraryHandle library) { FreeLibrary(static_cast<HMODULE>(library)); }
+void CloseLibrary(LibraryHandle library) {
+    FreeLibrary(static_cast<HMODULE>(library));
+}
 
 void* FindSymbol(LibraryHandle library, const char* name) {
     return reinterpret_cast<void*>(GetProcAddress(static_cast<HMODULE>(library), name));

@@ -15,7 +15,9 @@ namespace {
 using namespace kyvtest;
 using testing::ElementsAre;
 
-const EffectDescriptor& Temperature() { return Effect("Kyv_Dsp_Co_Temperature"); }
+const EffectDescriptor& Temperature() {
+    return Effect("Kyv_Dsp_Co_Temperature");
+}
 
 // A slow form that shares nothing with the effect: tables are not kept, every pixel is worked on
 // its own.
@@ -95,8 +97,8 @@ TEST(ColorTemperature, AllFormatsLayoutsFieldsAndLevelsMatchTheSlowForm) {
     constexpr int kWidth = 67;
     constexpr int kHeight = 5;
     const Frame source = RandomFrame(2 * kWidth * kHeight, 1);
-    for (const auto& [temperature, tint] : {std::tuple{0.7F, 0.0F}, {-0.35F, 0.9F}, {0.0F, -1.0F},
-                                            {1.0F, 1.0F}, {0.125F, -0.5F}}) {
+    for (const auto& [temperature, tint] :
+         {std::tuple{0.7F, 0.0F}, {-0.35F, 0.9F}, {0.0F, -1.0F}, {1.0F, 1.0F}, {0.125F, -0.5F}}) {
         for (const uint32_t layout : {0U, 1U, 2U}) {
             for (const uint32_t field : {0U, 1U, 2U}) {
                 for (const uint32_t compare : {0U, 1U}) {
@@ -230,9 +232,9 @@ TEST(ColorTemperature, NotANumberIsNoIdentityAndChangesNoColour) {
 
 TEST(ColorTemperature, SideBySideShowsTheCentreTwice) {
     // Width 8: columns 2..5 twice. Width 7: columns 1..3 twice, and column 4 continues.
-    for (const auto& [width, columns] :
-         {std::pair{8U, std::vector{2, 3, 4, 5, 2, 3, 4, 5}}, {7U, {1, 2, 3, 1, 2, 3, 4}},
-          {1U, {0}}}) {
+    for (const auto& [width, columns] : {std::pair{8U, std::vector{2, 3, 4, 5, 2, 3, 4, 5}},
+                                         {7U, {1, 2, 3, 1, 2, 3, 4}},
+                                         {1U, {0}}}) {
         for (const uint32_t layout : {0U, 1U, 2U}) {
             const uint32_t stride = layout ? 2 * width : width;
             const Frame input = RandomFrame(stride * 2, 4);

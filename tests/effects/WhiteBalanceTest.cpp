@@ -13,7 +13,9 @@ namespace {
 using namespace kyvtest;
 using testing::ElementsAre;
 
-const EffectDescriptor& Balance() { return Effect("Kyv_Dsp_Co_WhiteBalance"); }
+const EffectDescriptor& Balance() {
+    return Effect("Kyv_Dsp_Co_WhiteBalance");
+}
 
 // Renders one row of pixels with a reference colour (red in the lowest byte).
 Frame Render(const Frame& input, uint32_t reference, uint32_t compare = 0, int32_t level = 0) {

@@ -11,14 +11,16 @@
 
 namespace kyvtest {
 
-std::string ModuleFile() { return KYV_MODULE_FILE; }
+std::string ModuleFile() {
+    return KYV_MODULE_FILE;
+}
 
 const ModuleDescriptor& Module() {
     static const ModuleDescriptor* const module = [] {
         const kyv::LibraryHandle library =
             kyv::OpenLibrary(std::filesystem::path(ModuleFile()).native());
-        const auto init = reinterpret_cast<KyvInitModuleFunction>(
-            kyv::FindSymbol(library, KYV_INIT_MODULE_NAME));
+        const auto init =
+            reinterpret_cast<KyvInitModuleFunction>(kyv::FindSymbol(library, KYV_INIT_MODULE_NAME));
         ModuleDescriptor* descriptor = nullptr;
         if (!init || init(&descriptor) != KYV_OK) {
             ADD_FAILURE() << "cannot load " << ModuleFile();
@@ -55,7 +57,9 @@ CTestInstance::CTestInstance(const EffectDescriptor& effect, uint32_t width, uin
     EXPECT_EQ(Call(effect.callbacks.InitInstance), KYV_OK);
 }
 
-CTestInstance::~CTestInstance() { EXPECT_EQ(Call(Descriptor().callbacks.DestroyInstance), KYV_OK); }
+CTestInstance::~CTestInstance() {
+    EXPECT_EQ(Call(Descriptor().callbacks.DestroyInstance), KYV_OK);
+}
 
 KyvStatus CTestInstance::SetInput(uint32_t index, const void* frame) {
     m_context.frame = const_cast<void*>(frame);

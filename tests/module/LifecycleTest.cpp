@@ -1,0 +1,208 @@
+// The calling protocol, for all twelve effects alike.
+#include <algorithm>
+#include <array>
+#include <random>
+#include <thread>
+
+#include <gtest/gtest.h>
+
+#include "tests/support/TestHost.h"
+
+namespace {
+
+using namespace kyvtest;
+
+class Lifecycle : public testing::TestWithParam<uint32_t> {
+protected:
+    const EffectDescriptor& effect() const { return Module().effects[GetParam()]; }
+};
+
+INSTANTIATE_TEST_SUITE_P(AllEffects, Lifecycle, testing::Range(0U, 12U), [](const auto& entry) {
+    return std::string(Module().effects[entry.param].identifier);
+});
+
+size_t ParamBytes(const EffectDescriptor& effect) {
+    size_t bytes = 0;
+    for (uint32_t i = 0; i < effect.paramCount; ++i) {
+        bytes += effect.params[i].valueSize;
+    }
+    return bytes;
+}
+
+TEST_P(Lifecycle, NullContextAndNullInstanceDataAreStatuses) {
+    const EffectCallbacks& call = effect().callbacks;
+    for (const EffectCallback callback :
+         {call.InitInstance, call.DestroyInstance, call.ProcessFrame, call.BeginProcessing,
+          call.EndProcessing}) {
+        EXPECT_EQ(callback(nullptr), 0x80004005U);
+    }
+    EXPECT_EQ(call.SetInputFrame(0, nullptr), 0x80004005U);
+
+    EffectContext context = {};
+    context.descriptor = &effect();
+    EXPECT_EQ(call.DestroyInstance(&context), 0U);
+    EXPECT_EQ(call.EndProcessing(&context), 0U);
+    EXPECT_EQ(call.SetInputFrame(0, &context), 0x80004005U);
+    EXPECT_EQ(call.BeginProcessing(&context), 0x80004005U);
+    EXPECT_EQ(call.ProcessFrame(&context), 0x80004005U);
+    EXPECT_EQ(call.InitInstance(&context), 0x80004005U); // no parameter buffer
+}
+
+// A host object that notes what the parameter buffer held when it was notified.
+struct Witness : HostNotification {
+    HostNotificationTable operations = {[](HostNotification* self) {
+        auto* witness = static_cast<Witness*>(self);
+        ++witness->calls;
+        witness->seen = *witness->watched;
+    }};
+    const uint8_t* watched = nullptr;
+    uint8_t seen = 0;
+    int calls = 0;
+};
+
+TEST_P(Lifecycle, InitInstanceNotifiesFirstAndWritesThePackedDefaultsOnly) {
+    const size_t bytes = ParamBytes(effect());
+    std::vector<uint8_t> buffer(bytes + 32, 0xA5);
+    Witness witness;
+    witness.table = &witness.operations;
+    witness.watched = &buffer[16];
+
+    EffectContext context = {};
+    context.descriptor = &effect();
+    context.notification = &witness;
+    context.params = &buffer[16];
+    ASSERT_EQ(effect().callbacks.InitInstance(&context), 0U);
+
+    std::vector<uint8_t> expected(16, 0xA5);
+    for (uint32_t i = 0; i < effect().paramCount; ++i) {
+        const auto* value = static_cast<const uint8_t*>(effect().params[i].defaultValue);
+        expected.insert(expected.end(), value, value + effect().params[i].valueSize);
+    }
+    expected.insert(expected.end(), 16, 0xA5);
+    EXPECT_EQ(buffer, expected);
+    EXPECT_EQ(witness.calls, 1);
+    EXPECT_EQ(witness.seen, 0xA5);
+}
+
+TEST(InitInstance, PictureInPictureHas105ParameterBytes) {
+    EXPECT_EQ(ParamBytes(Effect("Kyv_Dsp_Pi_Freeform")), 105U);
+}
+
+TEST_P(Lifecycle, SetInputFrameFillsTheLeadingPointers) {
+    CTestInstance instance(effect(), 4, 4);
+    std::array<void*, 4> frames;
+    for (uint32_t i = 0; i < 4; ++i) {
+        frames[i] = reinterpret_cast<void*>(uintptr_t{0x1000} * (i + 1));
+    }
+    auto* inputs = static_cast<void**>(instance.Context().instanceData);
+    ASSERT_EQ(instance.SetInput(0, frames[0]), 0U);
+    EXPECT_EQ(inputs[0], frames[0]);
+    EXPECT_EQ(inputs[1], nullptr);
+    ASSERT_EQ(instance.SetInput(1, frames[1]), 0U);
+    ASSERT_EQ(instance.SetInput(5, frames[2]), 0U);
+    const bool two = effect().properties.inputCount == 2;
+    EXPECT_EQ(inputs[0], two ? frames[0] : frames[2]);
+    EXPECT_EQ(inputs[1], two ? frames[2] : nullptr);
+    inputs[0] = inputs[1] = nullptr;
+}
+
+TEST_P(Lifecycle, RequestFlagsAreSetByTheEffectsThatNeedThem) {
+    CTestInstance instance(effect(), 4, 4);
+    ASSERT_EQ(instance.Begin(), 0U);
+    const std::string id = effect().identifier;
+    const bool color = id.starts_with("Kyv_Dsp_Co_");
+    const bool transition = id.starts_with("DSP_TR_");
+    const bool sprites = id.ends_with("Bubble") || id.ends_with("Fireworks");
+    EXPECT_EQ(instance.Context().requestA, color || transition ? 1U : 0U);
+    EXPECT_EQ(instance.Context().requestB,
+              color || sprites || id == "Kyv_Dsp_Vi_LightRay" ? 1U : 0U);
+}
+
+// Calls in random order on frames with guards: nothing crashes, nothing is written outside the
+// frame, no status but the known ones comes back.
+TEST_P(Lifecycle, SurvivesAnyOrderOfCalls) {
+    constexpr uint32_t kGuard = 0xDEADBEEF;
+    constexpr size_t kGuardPixels = 64;
+    std::mt19937 random(GetParam());
+    for (int round = 0; round < 10; ++round) {
+        const uint32_t width = 1 + random() % 40;
+        const uint32_t height = 1 + random() % 20;
+        const size_t pixels = size_t{2} * width * height;
+        const Frame input = RandomFrame(pixels, random());
+        Frame output(pixels + 2 * kGuardPixels, kGuard);
+        CTestInstance instance(effect(), width, height);
+        EffectContext& context = instance.Context();
+        for (int call = 0; call < 20; ++call) {
+            context.pixelFormat = random() % 3;
+            context.stereoLayout = random() % 4;
+            context.fieldSelector = random() % 4;
+            context.cpuLevel = static_cast<int32_t>(random() % 7) - 1;
+            context.position = static_cast<int64_t>(random() % 100) * 1000000;
+            context.duration = static_cast<int64_t>(random() % 3) * 50000000;
+            context.threadCount = random() % 4;
+            KyvStatus status = 0;
+            switch (random() % 6) {
+            case 0:
+                status = instance.Begin();
+                break;
+            case 1:
+                status = instance.End();
+                break;
+            case 2:
+                status = instance.Process(random() % 4 ? &output[kGuardPixels] : nullptr);
+                break;
+            case 3:
+                status = instance.SetInput(random() % 3, random() % 4 ? input.data() : nullptr);
+                break;
+            default:
+                status = instance.Render(&output[kGuardPixels], input.data(), input.data());
+                break;
+            }
+            EXPECT_TRUE(status == KYV_OK || status == KYV_FAIL) << std::hex << status;
+        }
+        const auto guarded = [](uint32_t pixel) { return pixel == kGuard; };
+        EXPECT_TRUE(std::all_of(output.begin(), output.begin() + kGuardPixels, guarded));
+        EXPECT_TRUE(std::all_of(output.end() - kGuardPixels, output.end(), guarded));
+    }
+}
+
+TEST_P(Lifecycle, AbsurdFrameSizesAreRefused) {
+    const Frame input(16);
+    Frame output(16, 3);
+    for (const auto& [width, height] :
+         {std::pair{0U, 4U}, {4U, 0U}, {0xFFFFFFFFU, 1U}, {1U, 0x80000000U}, {0U, 0U}}) {
+        CTestInstance instance(effect(), width, height);
+        instance.Begin();
+        instance.Render(output.data(), input.data(), input.data());
+        EXPECT_EQ(output, Frame(16, 3)) << width << " x " << height;
+    }
+}
+
+TEST_P(Lifecycle, InstancesOnTwoThreadsGiveWhatEachGivesAlone) {
+    const auto render = [this](uint32_t seed) {
+        Frame all;
+        CTestInstance instance(effect(), 33, 17);
+        instance.Context().cpuLevel = 5;
+        instance.Context().threadCount = 2;
+        instance.Context().duration = 100000000;
+        EXPECT_EQ(instance.Begin(), KYV_OK);
+        for (int frame = 0; frame < 5; ++frame) {
+            instance.Context().position = frame * 400000;
+            const Frame input = RandomFrame(33 * 17, seed + frame);
+            Frame output(input.size());
+            EXPECT_EQ(instance.Render(output.data(), input.data(), input.data()), KYV_OK);
+            all.insert(all.end(), output.begin(), output.end());
+        }
+        return all;
+    };
+    const Frame alone[2] = {render(1), render(100)};
+    Frame together[2];
+    std::thread first([&] { together[0] = render(1); });
+    std::thread second([&] { together[1] = render(100); });
+    first.join();
+    second.join();
+    EXPECT_EQ(together[0], alone[0]);
+    EXPECT_EQ(together[1], alone[1]);
+}
+
+} // namespace
