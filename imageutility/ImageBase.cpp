@@ -70,7 +70,7 @@ int32_t CImageBase::GetPixelCount() const {
 uint8_t* CImageBase::GetPixelAddress(uint32_t x, uint32_t y) const {
     const int32_t offset = kyv::WrapAdd(kyv::WrapMul(static_cast<int32_t>(y), m_nPitch),
                                         kyv::WrapMul(static_cast<int32_t>(x), m_nBytesPerPixel));
-    return reinterpret_cast<uint8_t*>(reinterpret_cast<intptr_t>(m_pBuffer) + offset);
+    return m_pBuffer ? m_pBuffer + offset : nullptr;
 }
 
 bool CImageBase::IsSameSize(const CImageBase& other) const {

@@ -51,7 +51,7 @@ public:
     int32_t GetPixelCount() const;
     uint8_t* GetBuffer() const { return m_pBuffer; }
 
-    // The offset is formed in signed 32-bit arithmetic and not checked.
+    // The offset is formed in signed 32-bit arithmetic and not checked. Null for an empty image.
     uint8_t* GetPixelAddress(uint32_t x, uint32_t y) const;
 
     // Width and height alone are compared.

@@ -240,7 +240,7 @@ struct Table {
         ParamValue values[6];
     };
 
-    static consteval std::array<Values, kCount> CopyValues() {
+    static constexpr std::array<Values, kCount> CopyValues() {
         std::array<Values, kCount> all = {};
         for (size_t i = 0; i < kCount; ++i) {
             for (size_t j = 0; j < 6; ++j) {
@@ -252,7 +252,7 @@ struct Table {
 
     static constexpr std::array<Values, kCount> kValues = CopyValues();
 
-    static consteval std::array<ParamDescriptor, kCount> MakeRecords() {
+    static constexpr std::array<ParamDescriptor, kCount> MakeRecords() {
         std::array<ParamDescriptor, kCount> records = {};
         for (size_t i = 0; i < kCount; ++i) {
             const ParamRow& row = Rows[i];

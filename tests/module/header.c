@@ -1,6 +1,5 @@
 /* The public header serves C, alone and twice. */
 #include "module/HostInterface.h"
-#include "module/HostInterface.h"
 
 KyvStatus UseHeader(EffectContext* context);
 
