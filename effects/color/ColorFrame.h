@@ -1,53 +1,92 @@
-// What the colour corrections share: a frame of either pixel format as rows of B, G, R, A, and the
-// comparison that leaves the left half of the picture as it was.
+// What the colour corrections share: a frame of either pixel format treated as rows of B, G, R, A,
+// and the comparison that leaves the left half of the picture as it was.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+#include <cstring>
 
-#include "imageutility/ImageUtility.h"
+#include "imageutility/kernels/ToARGB.h"
+#include "imageutility/kernels/ToAYUV.h"
 #include "module/FrameGeometry.h"
 
 namespace kyv {
 
-// One call's view as ARGB images. ARGB frames are wrapped; an AYUV frame is converted into a
-// private image on which the work runs in place, and Finish converts all of it back. So in AYUV
-// frames the rows that a field selector leaves out carry the source after its round trip, while in
-// ARGB frames they are not touched.
+// The rows that a call corrects: first, first + step, ...
+struct RowSelection {
+    int32_t first;
+    int32_t step;
+};
+
+// By the context's field selector.
+RowSelection SelectField(const EffectContext& context);
+
+// No row at all.
+inline constexpr RowSelection kNoRows = {INT32_MAX, 1};
+
+// The call's view of an input and an output frame, which may be one and the same.
+//
+// The corrections work on ARGB. ARGB frames are corrected from frame to frame, and rows outside the
+// selection are not touched. AYUV frames are converted, corrected and converted back; there every
+// row takes the round trip, so that rows outside the selection carry the source as it comes back
+// from RGB. The conversion goes through a block that stays in the nearest cache, so no frame is
+// ever held in between and nothing is allocated.
 class CColorFrame {
 public:
-    // input and output are whole frames of the geometry; they may be one and the same.
     CColorFrame(const EffectContext& context, const FrameGeometry& geometry, void* output,
                 const void* input);
 
-    // Applies a row operation, correct(dst, src, count), to the rows of the context's field. The
-    // first width / 2 pixels are copied as they are when compare is set.
+    // Calls correct(dst, src, count) for runs of B, G, R, A pixels of the selected rows. The first
+    // `spared` pixels of a row are left as they are. dst may be src itself.
     template <class Correct>
-    void ForEachRow(bool compare, Correct&& correct) {
-        const int32_t half = compare ? m_source.GetWidth() / 2 : 0;
-        for (int32_t y = m_firstRow; y < m_source.GetHeight(); y += m_rowStep) {
-            uint8_t* dst = m_target.Row(y);
-            const uint8_t* src = m_source.Row(y);
-            CopyPixels(dst, src, half);
-            correct(dst + half * 4, src + half * 4,
-                    static_cast<size_t>(m_source.GetWidth() - half));
+    void Process(RowSelection rows, int32_t spared, Correct&& correct) const {
+        if (m_ayuv) {
+            ProcessAyuv(rows, spared, correct);
+            return;
+        }
+        for (int64_t y = rows.first; y < m_height; y += rows.step) {
+            uint8_t* dst = Output(y);
+            const uint8_t* src = Input(y);
+            if (dst != src) {
+                std::memcpy(dst, src, static_cast<size_t>(spared) * 4);
+            }
+            correct(dst + size_t{4} * spared, src + size_t{4} * spared,
+                    static_cast<size_t>(m_width - spared));
         }
     }
 
-    // Writes an AYUV frame's view to the output. Nothing to do for ARGB frames.
-    void Finish();
-
 private:
-    static void CopyPixels(uint8_t* dst, const uint8_t* src, int32_t count);
+    static constexpr int32_t kBlockPixels = 1024;
 
-    const FrameGeometry m_geometry;
+    uint8_t* Output(int64_t y) const { return m_pOutput + y * m_pitch; }
+    const uint8_t* Input(int64_t y) const { return m_pInput + y * m_pitch; }
+
+    template <class Correct>
+    void ProcessAyuv(RowSelection rows, int32_t spared, Correct&& correct) const {
+        uint8_t block[kBlockPixels * 4];
+        for (int32_t y = 0; y < m_height; ++y) {
+            const bool selected = y >= rows.first && (y - rows.first) % rows.step == 0;
+            for (int32_t x = 0; x < m_width; x += kBlockPixels) {
+                const int32_t count = m_width - x < kBlockPixels ? m_width - x : kBlockPixels;
+                const int32_t skip = spared <= x ? 0 : spared - x < count ? spared - x : count;
+                m_toArgb(block, Input(y) + size_t{4} * x, static_cast<size_t>(count));
+                if (selected && skip < count) {
+                    uint8_t* from = block + size_t{4} * skip;
+                    correct(from, from, static_cast<size_t>(count - skip));
+                }
+                m_toAyuv(Output(y) + size_t{4} * x, block, static_cast<size_t>(count));
+            }
+        }
+    }
+
     uint8_t* m_pOutput;
-    int32_t m_cpuLevel;
-    int32_t m_firstRow = 0;
-    int32_t m_rowStep = 1;
+    const uint8_t* m_pInput;
+    int32_t m_width;
+    int32_t m_height;
+    int32_t m_pitch;
     bool m_ayuv;
-    KYVImageUtility::CImageARGB m_private; // of AYUV frames
-    KYVImageUtility::CImageARGB m_source;
-    KYVImageUtility::CImageARGB m_target;
+    ToARGBRow m_toArgb;
+    ToAYUVRow m_toAyuv;
 };
 
 } // namespace kyv

@@ -132,12 +132,12 @@ KyvStatus ColorTemperature::Process(EffectContext& context, Instance& instance) 
         instance.tintDegree = tint;
     }
 
-    CColorFrame frame(context, geometry, instance.output, input);
+    const CColorFrame frame(context, geometry, instance.output, input);
     const ColorTemperatureRow row = kColorTemperatureRow.For(Resolve(context.cpuLevel));
-    frame.ForEachRow(comparison != 0, [&](uint8_t* dst, const uint8_t* src, size_t count) {
-        row(dst, src, count, instance.temperature, instance.tint);
-    });
-    frame.Finish();
+    frame.Process(SelectField(context), comparison != 0 ? geometry.width / 2 : 0,
+                  [&](uint8_t* dst, const uint8_t* src, size_t count) {
+                      row(dst, src, count, instance.temperature, instance.tint);
+                  });
     return KYV_OK;
 }
 

@@ -81,14 +81,12 @@ KyvStatus WhiteBalance::Process(EffectContext& context, Instance& instance) {
         BuildTable(instance.blue, b, luma);
     }
 
-    CColorFrame frame(context, geometry, instance.output, instance.input);
-    if (wholeFrame) {
-        const WhiteBalanceRow row = kWhiteBalanceRow.For(Resolve(context.cpuLevel));
-        frame.ForEachRow(compare, [&](uint8_t* dst, const uint8_t* src, size_t count) {
-            row(dst, src, count, instance.blue, instance.green, instance.red);
-        });
-    }
-    frame.Finish();
+    const CColorFrame frame(context, geometry, instance.output, instance.input);
+    const WhiteBalanceRow row = kWhiteBalanceRow.For(Resolve(context.cpuLevel));
+    frame.Process(wholeFrame ? SelectField(context) : kNoRows, compare ? geometry.width / 2 : 0,
+                  [&](uint8_t* dst, const uint8_t* src, size_t count) {
+                      row(dst, src, count, instance.blue, instance.green, instance.red);
+                  });
     return KYV_OK;
 }
 

@@ -296,6 +296,26 @@ TEST(ColorTemperature, WorksInPlace) {
     }
 }
 
+TEST(ColorTemperature, WideAyuvFramesAreSplitWithoutASeam) {
+    constexpr int kWidth = 5003; // the comparison ends inside one of several blocks
+    const Frame input = RandomFrame(kWidth, 7);
+    Frame expected = Convert(input, kWidth, 1, false);
+    for (int x = kWidth / 2; x < kWidth; ++x) {
+        expected[x] = SlowPixel(expected[x], 0.25, -0.5);
+    }
+    expected = Convert(expected, kWidth, 1, true);
+
+    CTestInstance instance(Temperature(), kWidth, 1);
+    instance.Context().pixelFormat = PixelFormat_Ayuv;
+    ASSERT_EQ(instance.Begin(), KYV_OK);
+    instance.Set("P1", 0.25F);
+    instance.Set("P2", 1);
+    instance.Set("P3", -0.5F);
+    Frame output(kWidth);
+    ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+    EXPECT_EQ(output, expected);
+}
+
 TEST(ColorTemperature, FieldOfARowThatIsNotThereTreatsNothing) {
     CTestInstance instance(Temperature(), 3, 1);
     instance.Context().fieldSelector = FieldSelector_Second;
