@@ -290,7 +290,8 @@ struct EffectContext {
     uint32_t threadCount;               // 0xd0  threads granted to the instance
     uint32_t reservedD4[3];             // 0xd4
     uint32_t requestA;                  // 0xe0  set to 1 by some effects' BeginProcessing
-    uint32_t reservedE4[8];             // 0xe4
+    uint32_t reservedE4[7];             // 0xe4
+    uint32_t gpuVariant;                // 0x100 0 to 3: which of the dreamy's Cudart renders
     int32_t cpuLevel;                   // 0x104 enum CpuLevel
     uint32_t reserved108;               // 0x108
     uint32_t randomSeed;                // 0x10c read by the pencil sketch's BeginProcessing
@@ -407,6 +408,7 @@ KYV_AT(EffectContext, preview, 0xc8);
 KYV_AT(EffectContext, previewFraction, 0xcc);
 KYV_AT(EffectContext, threadCount, 0xd0);
 KYV_AT(EffectContext, requestA, 0xe0);
+KYV_AT(EffectContext, gpuVariant, 0x100);
 KYV_AT(EffectContext, cpuLevel, 0x104);
 KYV_AT(EffectContext, randomSeed, 0x10c);
 KYV_AT(EffectContext, requestB, 0x110);

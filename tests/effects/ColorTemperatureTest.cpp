@@ -253,7 +253,7 @@ TEST(ColorTemperature, SideBySideShowsTheCentreTwice) {
                 for (uint32_t x = 0; x < width; ++x) {
                     const uint32_t from = input[y * stride + left + columns[x]];
                     EXPECT_EQ(output[y * stride + left + x],
-                              x < width / 2 ? from : SlowPixel(from, 0.4, 0.0))
+                              x < width / 2 ? from : SlowPixel(from, 0.4F, 0.0))
                         << "width " << width << " layout " << layout << " at " << x << "," << y;
                 }
             }
