@@ -12,6 +12,8 @@ namespace kyv {
 using ToARGBRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count);
 
 void ToARGB_scalar(uint8_t* dst, const uint8_t* src, size_t count);
+void ToARGB_sse2(uint8_t* dst, const uint8_t* src, size_t count);
+void ToARGB_avx2(uint8_t* dst, const uint8_t* src, size_t count);
 
 extern const KernelTable<ToARGBRow> kToARGB;
 

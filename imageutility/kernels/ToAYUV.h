@@ -12,6 +12,9 @@ namespace kyv {
 using ToAYUVRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count);
 
 void ToAYUV_scalar(uint8_t* dst, const uint8_t* src, size_t count);
+void ToAYUV_sse2(uint8_t* dst, const uint8_t* src, size_t count);
+void ToAYUV_ssse3(uint8_t* dst, const uint8_t* src, size_t count);
+void ToAYUV_avx2(uint8_t* dst, const uint8_t* src, size_t count);
 
 extern const KernelTable<ToAYUVRow> kToAYUV;
 
