@@ -15,6 +15,9 @@ using NativeString = std::filesystem::path::string_type;
 // Room for a path or a path's candidate, with its terminating zero.
 inline constexpr size_t kMaxPathUnits = 260;
 
+// The library, or the program, that this code is linked into. The reference stays its loader's.
+LibraryHandle OwnLibrary();
+
 // The full path, without "." or ".." parts, of a loaded library; at most kMaxPathUnits - 1 units,
 // cut off beyond. Empty when the handle is unknown.
 NativeString LibraryFileName(LibraryHandle library);

@@ -57,6 +57,21 @@ std::string_view UserLocale() {
 
 } // namespace
 
+LibraryHandle OwnLibrary() {
+    Dl_info info;
+    link_map* map = nullptr;
+    if (!dladdr1(kLanguageNames, &info, reinterpret_cast<void**>(&map), RTLD_DL_LINKMAP)) {
+        return nullptr;
+    }
+    // It is loaded already, so this only yields the handle; closing it again leaves the count as
+    // it was. The program comes first in the list and is opened without a name.
+    void* const self = dlopen(map->l_prev ? map->l_name : nullptr, RTLD_LAZY | RTLD_NOLOAD);
+    if (self) {
+        dlclose(self);
+    }
+    return self;
+}
+
 NativeString LibraryFileName(LibraryHandle library) {
     const link_map* map = nullptr;
     if (!library || dlinfo(library, RTLD_DI_LINKMAP, &map) != 0 || !map->l_name) {

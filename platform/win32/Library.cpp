@@ -3,7 +3,14 @@
 
 #include <windows.h>
 
+// The first byte of the image that this file is linked into; its address is the handle.
+extern "C" IMAGE_DOS_HEADER __ImageBase;
+
 namespace kyv {
+
+LibraryHandle OwnLibrary() {
+    return &__ImageBase;
+}
 
 NativeString LibraryFileName(LibraryHandle library) {
     wchar_t path[kMaxPathUnits];
