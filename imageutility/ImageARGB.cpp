@@ -31,4 +31,8 @@ int32_t CImageARGB::GetSubImage(CImageARGB& view, int32_t x, int32_t y, int32_t 
     return MakeView(view, x, y, w, h);
 }
 
+void CImageARGB::Swap(CImageARGB& other) {
+    SwapBuffers(other);
+}
+
 } // namespace KYVImageUtility

@@ -5,6 +5,7 @@
 #include <cstring>
 #include <limits>
 #include <new>
+#include <utility>
 
 #include "platform/Status.h"
 #include "platform/WrapMath.h"
@@ -128,6 +129,15 @@ void CImageBase::CopyRowsFrom(const CImageBase& source) {
     for (int32_t y = 0; y < m_nHeight; ++y) {
         std::memmove(Row(y), source.Row(y), rowBytes);
     }
+}
+
+void CImageBase::SwapBuffers(CImageBase& other) {
+    std::swap(m_pBuffer, other.m_pBuffer);
+    std::swap(m_nWidth, other.m_nWidth);
+    std::swap(m_nHeight, other.m_nHeight);
+    std::swap(m_nPitch, other.m_nPitch);
+    std::swap(m_nBytesPerPixel, other.m_nBytesPerPixel);
+    std::swap(m_bOwnsBuffer, other.m_bOwnsBuffer);
 }
 
 int32_t CImageBase::MakeView(CImageBase& view, int32_t x, int32_t y, int32_t w, int32_t h) const {

@@ -81,6 +81,7 @@ protected:
     void AttachBuffer(uint8_t* pixels, int32_t width, int32_t height, int32_t pitch,
                       int32_t bytesPerPixel);
     void CopyRowsFrom(const CImageBase& source);
+    void SwapBuffers(CImageBase& other);
     int32_t MakeView(CImageBase& view, int32_t x, int32_t y, int32_t w, int32_t h) const;
 
 private:
@@ -123,6 +124,9 @@ public:
     void Attach(uint8_t* pixels, int32_t width, int32_t height, int32_t pitch);
     void CopyFrom(const CImageARGB& source);
     int32_t GetSubImage(CImageARGB& view, int32_t x, int32_t y, int32_t w, int32_t h) const;
+
+    // Exchanges pixels and their ownership; each image keeps its decode option and level.
+    void Swap(CImageARGB& other);
 
     // BT.601 studio range, rounded; alpha is copied.
     void ToAYUV(CImageAYUV& destination) const;
