@@ -3,6 +3,8 @@
 
 #include <cstring>
 
+#include "platform/win32/PictureSize.h"
+
 namespace kyv {
 namespace {
 
@@ -36,7 +38,8 @@ void CGdiPlusBitmap::Release() {
 
 void CGdiPlusBitmap::LoadFile(const wchar_t* path) {
     Release();
-    if (Gdip::GdipCreateBitmapFromFile(path, &m_pBitmap) != Gdiplus::Ok) {
+    CFileSource file(path);
+    if (HasSaneSize(file) && Gdip::GdipCreateBitmapFromFile(path, &m_pBitmap) != Gdiplus::Ok) {
         Release();
     }
 }
@@ -105,7 +108,8 @@ void CGdiPlusBitmapResource::Load(HMODULE module, const char* type, uint16_t id)
     const DWORD size = resource ? SizeofResource(module, resource) : 0;
     const HGLOBAL loaded = size ? LoadResource(module, resource) : nullptr;
     const void* const bytes = loaded ? LockResource(loaded) : nullptr;
-    m_hBlock = bytes ? GlobalAlloc(GMEM_MOVEABLE, size) : nullptr;
+    CMemorySource source(bytes, bytes ? size : 0);
+    m_hBlock = HasSaneSize(source) ? GlobalAlloc(GMEM_MOVEABLE, size) : nullptr;
     if (!m_hBlock) {
         return;
     }
