@@ -57,6 +57,8 @@ public:
     // Width and height alone are compared.
     bool IsSameSize(const CImageBase& other) const;
 
+    int32_t GetBytesPerPixel() const { return m_nBytesPerPixel; }
+
     // Sets pitch * height bytes from the buffer's start, padding included. Meant for whole images:
     // in a view that begins inside a row the last row's padding is not the view's.
     void FillBytes(uint8_t value);
@@ -139,6 +141,86 @@ public:
     void ToHSL(CImageByte& hue, CImageByte& saturation, CImageByte& lightness) const;
     // Sets B, G and R; alpha is kept.
     void FromHSL(const CImageByte& hue, const CImageByte& saturation, const CImageByte& lightness);
+
+    // Scales the whole image into the whole destination, whose memory must be another. Both must
+    // be at least 2 x 2. Alpha is scaled like a colour.
+    //   0  bilinear, with 7 bits of fraction; every effect uses this one
+    //   1  row pick: equal widths only, each row a copy of the nearest. What the destination's
+    //      pitch has beyond its width is set to 0, in the last row too, so not for views.
+    //   2  four taps each way: a cubic that passes through the samples, rounded and clamped
+    // Any other mode does nothing.
+    void Resize(CImageARGB& destination, int32_t mode) const;
+    // The same; false when nothing was written, for callers that go on with the result.
+    bool TryResize(CImageARGB& destination, int32_t mode) const;
+
+    // The blends work on this image and a source of the same size, which may be this image itself.
+    // w is source alpha times opacity, ((opacity + 1) * alpha) >> 8, that is 0..255. They treat B,
+    // G and R alike, so views of AYUV pixels can be blended and scaled as well.
+
+    // (s * w + d * (256 - w)) >> 8; alpha is kept. White over black at full weight is 254.
+    void AlphaBlend(const CImageARGB& source, uint8_t opacity);
+    // min(255, d + ((s * w) >> 8)). Levels 1 and 2 add alpha the same way; all others keep it.
+    void AddBlend(const CImageARGB& source, uint8_t opacity);
+    // 255 - (((255 - s) * (255 - d)) >> 8); alpha is kept. Two blacks give 1.
+    void ScreenBlend(const CImageARGB& source);
+    // Straight-alpha "over". Where w is 255 or this image is clear the source's colour is taken
+    // and the alpha becomes w; where w is 0 the pixel stays.
+    void CompositeOver(const CImageARGB& source, uint8_t opacity);
+
+    // Scales the sprite into the rectangle and blends it there; positions and sizes in pixels are
+    // truncated. Modes: 0 AlphaBlend, 1 AddBlend, 7 CompositeOver, 8 CompositeOver and then an
+    // opaque result; any other paints opaque red, as a sign of a mode that does not exist.
+    // At an edge only the part of the sprite inside is drawn, if it is more than 2 pixels each way
+    // in the sprite and in this image. A sprite or a rectangle of less than 2 pixels cannot be
+    // scaled and draws nothing, nor does a position that is not a number. This image's level
+    // rules throughout.
+    // Throws std::bad_alloc, with nothing drawn.
+    void DrawSprite(const CImageARGB& sprite, int32_t mode, float x, float y, float w, float h,
+                    uint8_t opacity);
+
+    // The bilinear B, G and R at a position in 1/65536 pixel, which the caller keeps inside:
+    // 0 <= x >> 16 < width and 0 <= y >> 16 < height; nothing is checked but the buffer. In the
+    // last column the right neighbour is the pixel itself, in the last row both lower ones are.
+    void SampleBilinear(int32_t x, int32_t y, uint8_t* bgr) const;
+
+    // Copies the alpha of a 4-byte image, or one channel (0 B, 1 G, 2 R, 3 alpha) from or to a byte
+    // image. Sizes may differ: the destination's is meant, and a smaller source gives what it has.
+    void CopyAlphaFrom(const CImageBase& source);
+    void SetChannel(const CImageByte& source, int32_t channel);
+    void GetChannel(CImageByte& destination, int32_t channel) const;
+
+    // Sets the colour of every pixel and keeps alpha, or the other way round.
+    void FillColor(uint8_t r, uint8_t g, uint8_t b);
+    void SetAlpha(uint8_t value);
+    // Sets the colour of the pixels that differ from the key by at most the tolerance in each of
+    // B, G and R; alpha is kept.
+    void FillColorKeyed(uint8_t keyR, uint8_t keyG, uint8_t keyB, uint8_t tolerance, uint8_t r,
+                        uint8_t g, uint8_t b);
+
+    // The adjustments keep alpha, and change nothing when their argument is out of range or not a
+    // number.
+
+    // Scales B, G and R about 128 by 0..2; 1 changes nothing. 12 bits of fraction, rounded.
+    void Contrast(float factor);
+    // -1 is black, 1 is white, 0 changes nothing: moves B, G and R by that part of the room there
+    // is. 12 bits of fraction, rounded.
+    void AdjustLightness(float amount);
+    // 0 is grey, 100 changes nothing, 200 doubles the distance from the grey of the same
+    // brightness. Greys stay. Rounded and clamped.
+    void AdjustSaturation(int32_t percent);
+    // Takes the first byte of the other image's pixel, of any kind, off B, G and R, down to 0.
+    void SubtractGray(const CImageBase& gray);
+
+    // Each byte becomes the average of the square of 2 * radius + 1 pixels around it, as far as it
+    // is inside the image: sum / pixels inside, truncated. A radius that is not less than half the
+    // shorter side is reduced to (shorter side - 1) / 2; 0 copies and a negative one does nothing.
+    // The destination, of the same size, may be this image itself but not overlap it otherwise.
+    // The cost does not depend on the radius. Without memory for the scratch nothing is written.
+    void BoxBlur(CImageARGB& destination, int32_t radius) const;
+
+    // 128 plus the luma of the neighbour in a direction less that of the opposite one, clamped.
+    // 0 right, 1 right and down, 2 down and so on to 7, right and up. The border repeats itself.
+    void Relief(CImageByte& destination, int32_t direction) const;
 };
 
 class CImageAYUV : public CImageBase {
@@ -155,6 +237,14 @@ public:
 
     // Clamped to 0..255; alpha is copied.
     void ToARGB(CImageARGB& destination) const;
+
+    // As for CImageARGB.
+    void CopyAlphaFrom(const CImageBase& source);
+    void BoxBlur(CImageAYUV& destination, int32_t radius) const;
+
+    // Scales R, G, B and alpha of every pixel that is not clear by factors in 1/256. The colour is
+    // not clamped on the way there and back; bytes that leave their range keep the low 8 bits.
+    void TintAYUV(uint8_t r, uint8_t g, uint8_t b, uint8_t a);
 };
 
 class CImageByte : public CImageBase {
@@ -167,6 +257,15 @@ public:
     void Create(int32_t width, int32_t height);
     void CopyFrom(const CImageByte& source);
     int32_t GetSubImage(CImageByte& view, int32_t x, int32_t y, int32_t w, int32_t h) const;
+
+    // Writes mark where gx^2 + gy^2 > 100 * threshold and 0 elsewhere and along the border; the
+    // gradients are differences of the sums of three pixels on either side. Both images must have
+    // rows without padding, and the threshold be at least 1. The destination is cleared first.
+    void EdgeMask(CImageByte& destination, int32_t threshold, uint8_t mark) const;
+    // Raises every value that is not below the threshold by the amount, up to 255.
+    void LiftAbove(uint8_t threshold, uint8_t amount);
+    // Takes the other image of the same size off this one, down to 0.
+    void Subtract(const CImageByte& other);
 };
 
 } // namespace KYVImageUtility

@@ -10,47 +10,12 @@
 #include "imageutility/kernels/ToARGB.h"
 #include "imageutility/kernels/ToAYUV.h"
 #include "imageutility/kernels/ToGray.h"
+#include "tests/support/KernelRows.h"
 
 namespace kyvtest {
 namespace {
 
 using kyv::InstructionSet;
-using kyv::KernelTable;
-
-// Completes an entry whose table holds row loops. bind(seed) makes the parameters and gives a
-// callable row(form, dst, sources, count), where sources are the rows' first bytes.
-template <class Function, class Bind>
-KernelEntry Rows(const KernelTable<Function>& table, KernelEntry entry, Bind bind) {
-    entry.hasForm = [&table](InstructionSet set) { return table.Exact(set) != nullptr; };
-    entry.prepare = [&table, bind](uint32_t seed) -> KernelRun {
-        return [&table, row = bind(seed)](InstructionSet set, const KernelBuffers& buffers) {
-            const Function form = table.Exact(set);
-            const uint8_t* sources[2] = {};
-            for (int32_t y = 0; y < buffers.size.height; ++y) {
-                for (size_t i = 0; i < buffers.sources.size(); ++i) {
-                    sources[i] = buffers.sources[i].pixels + y * buffers.sources[i].pitch;
-                }
-                row(form, buffers.dst + y * buffers.dstPitch, sources,
-                    static_cast<size_t>(buffers.size.width));
-            }
-        };
-    };
-    return entry;
-}
-
-// For row(dst, src, count).
-constexpr auto kUnary = [](uint32_t) {
-    return [](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
-        form(dst, src[0], count);
-    };
-};
-
-// For row(pixels, count).
-constexpr auto kInPlaceOnly = [](uint32_t) {
-    return [](auto form, uint8_t* pixels, const uint8_t* const*, size_t count) {
-        form(pixels, count);
-    };
-};
 
 // Tables of a straight rise, of a curve with a kink, or of anything at all.
 void FillTables(kyv::ColorTables& tables, std::mt19937& random) {
@@ -95,6 +60,7 @@ std::vector<KernelEntry> MakeCatalog() {
                 form(dst, src[0], count, tables.channel[0], tables.channel[1], tables.channel[2]);
             };
         }));
+    AddImageOperations(list);
     return list;
 }
 
