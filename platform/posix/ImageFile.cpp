@@ -33,10 +33,13 @@ public:
 
     bool IsOpen() const { return m_nFile >= 0; }
 
-    // The whole of a regular file. One that shrinks meanwhile is a failure.
+    // The whole of a regular file. One that shrinks meanwhile is a failure, and so is one that is
+    // too big for any picture that we would take.
     bool ReadAll(Bytes& bytes) const {
+        constexpr off_t kMaxBytes = off_t{1} << 32;
         struct stat attributes;
-        if (fstat(m_nFile, &attributes) != 0 || !S_ISREG(attributes.st_mode)) {
+        if (fstat(m_nFile, &attributes) != 0 || !S_ISREG(attributes.st_mode) ||
+            attributes.st_size > kMaxBytes) {
             return false;
         }
         bytes.resize(static_cast<size_t>(attributes.st_size));

@@ -8,6 +8,9 @@
 namespace kyv {
 namespace {
 
+// The library's limit of a million pixels a side is not ours.
+constexpr uint32_t kMaxSide = PNG_UINT_31_MAX;
+
 // Deflate unfolds a byte to at most 1032.
 constexpr uint32_t kBestCompression = 1032;
 
@@ -33,6 +36,7 @@ public:
         if (!m_pInfo || setjmp(png_jmpbuf(m_pPng))) {
             return false;
         }
+        png_set_user_limits(m_pPng, kMaxSide, kMaxSide);
         png_set_read_fn(m_pPng, this, Read);
         png_read_info(m_pPng, m_pInfo);
         const uint32_t width = png_get_image_width(m_pPng, m_pInfo);
@@ -108,6 +112,7 @@ public:
         if (!m_pInfo || setjmp(png_jmpbuf(m_pPng))) {
             return false;
         }
+        png_set_user_limits(m_pPng, kMaxSide, kMaxSide);
         png_set_write_fn(m_pPng, this, Write, nullptr);
         png_set_IHDR(m_pPng, m_pInfo, static_cast<uint32_t>(source.width),
                      static_cast<uint32_t>(source.height), 8, PNG_COLOR_TYPE_RGB_ALPHA,
