@@ -82,11 +82,13 @@ KyvStatus WhiteBalance::Process(EffectContext& context, Instance& instance) {
     }
 
     const CColorFrame frame(context, geometry, instance.output, instance.input);
+    const KneeCurves curves({instance.blue, instance.reference >> 16 & 255},
+                            {instance.green, instance.reference >> 8 & 255},
+                            {instance.red, instance.reference & 255});
     const WhiteBalanceRow row = kWhiteBalanceRow.For(Resolve(context.cpuLevel));
-    frame.Process(wholeFrame ? SelectField(context) : kNoRows, compare ? geometry.width / 2 : 0,
-                  [&](uint8_t* dst, const uint8_t* src, size_t count) {
-                      row(dst, src, count, instance.blue, instance.green, instance.red);
-                  });
+    frame.Process(
+        wholeFrame ? SelectField(context) : kNoRows, compare ? geometry.width / 2 : 0,
+        [&](uint8_t* dst, const uint8_t* src, size_t count) { row(dst, src, count, curves); });
     return KYV_OK;
 }
 
