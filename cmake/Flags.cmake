@@ -21,6 +21,10 @@ if(KYV_SANITIZE)
                         -fno-sanitize-recover=all)
     add_link_options(-fsanitize=${KYV_SANITIZE})
 endif()
+if(KYV_FUZZ)
+    # The fuzzer sees which branches of our code an input takes.
+    add_compile_options(-fsanitize=fuzzer-no-link)
+endif()
 if(WIN32)
     # The product needs nothing but system libraries.
     add_link_options(-static)
