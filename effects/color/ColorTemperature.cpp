@@ -16,8 +16,8 @@ struct ChannelGains {
     double gain[3];
 };
 
-constexpr ChannelGains kWarm = {{1.3, 1.06, 0.78}};
-constexpr ChannelGains kCool = {{0.32, 1.01, 1.24}};
+constexpr ChannelGains kCool = {{1.3, 1.06, 0.78}};
+constexpr ChannelGains kWarm = {{0.32, 1.01, 1.24}};
 constexpr ChannelGains kMagenta = {{1.68, 0.96, 1.3}};
 constexpr ChannelGains kGreen = {{0.95, 1.5, 0.76}};
 
@@ -124,7 +124,7 @@ KyvStatus ColorTemperature::Process(EffectContext& context, Instance& instance) 
 
     // Comparing the degrees keeps the tables of a run of frames with constant parameters.
     if (temperature != instance.temperatureDegree) {
-        BuildTables(instance.temperature, temperature, kWarm, kCool);
+        BuildTables(instance.temperature, temperature, kCool, kWarm);
         instance.temperatureDegree = temperature;
     }
     if (tint != instance.tintDegree) {

@@ -1,6 +1,6 @@
 // Colour temperature: shifts the picture between cool and warm and between green and magenta.
 //
-//   "P1"  float   -1 cool .. 1 warm
+//   "P1"  float   -1 warm .. 1 cool: like a higher colour temperature, a positive degree adds blue
 //   "P2"  int     comparison: 0 off, other values leave the left half unprocessed; 2 shows the
 //                 centre half of the picture twice, before and after (hosts set it although the
 //                 parameter is declared a boolean)

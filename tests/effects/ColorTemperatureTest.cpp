@@ -29,7 +29,7 @@ int SlowGain(int value, double degree, double positive, double negative) {
 
 uint32_t SlowPixel(uint32_t pixel, double temperature, double tint) {
     constexpr double kTable[3][4] = {
-        // warm, cool, magenta, green
+        // cool, warm, magenta, green
         {1.3, 0.32, 1.68, 0.95},
         {1.06, 1.01, 0.96, 1.5},
         {0.78, 1.24, 1.3, 0.76},
@@ -76,7 +76,7 @@ Frame Convert(const Frame& frame, int width, int height, bool toAyuv) {
     return result;
 }
 
-TEST(ColorTemperature, WarmAndCoolGainsOfSinglePixels) {
+TEST(ColorTemperature, CoolAndWarmGainsOfSinglePixels) {
     CTestInstance instance(Temperature(), 4, 1);
     ASSERT_EQ(instance.Begin(), KYV_OK);
     // Blue 200 x 1.3 = 260, capped; green 100 x 1.06 = 106; red 100 x 0.78 = 78. The second pixel
