@@ -26,7 +26,7 @@ int main(int argc, char** argv) {
     context.cpuLevel = CpuLevel_Avx2;
 
     effect->callbacks.InitInstance(&context); // the defaults
-    float warm = 0.5f;
+    float warm = -0.5f;
     memcpy(params, &warm, sizeof warm); // "P1" is the first value
     effect->callbacks.BeginProcessing(&context);
     context.frame = input;
