@@ -1,0 +1,176 @@
+// Child processes on Windows.
+#include "platform/Process.h"
+
+#include <algorithm>
+#include <mutex>
+#include <system_error>
+
+#include <windows.h>
+
+namespace kyv {
+namespace {
+
+constexpr DWORD kPipeBytes = 1 << 20;
+constexpr size_t kPieceBytes = 1 << 20; // of one read or write
+
+[[noreturn]] void Fail(const std::string& what) {
+    throw std::system_error(static_cast<int>(GetLastError()), std::system_category(), what);
+}
+
+std::wstring Wide(const std::string& text) {
+    return std::filesystem::path(std::u8string(text.begin(), text.end())).native();
+}
+
+class CHandle {
+public:
+    CHandle() = default;
+    explicit CHandle(HANDLE handle) : m_handle(handle) {}
+    ~CHandle() { Close(); }
+    CHandle(const CHandle&) = delete;
+    CHandle& operator=(CHandle&& other) noexcept {
+        std::swap(m_handle, other.m_handle);
+        return *this;
+    }
+
+    HANDLE Get() const { return m_handle; }
+    void Close() {
+        if (m_handle != INVALID_HANDLE_VALUE && m_handle) {
+            CloseHandle(m_handle);
+        }
+        m_handle = INVALID_HANDLE_VALUE;
+    }
+
+private:
+    HANDLE m_handle = INVALID_HANDLE_VALUE;
+};
+
+// One command line from which the usual argument rules restore the list: quotes round everything,
+// backslashes doubled where a quote follows.
+std::wstring Quote(const std::wstring& argument) {
+    std::wstring quoted = L"\"";
+    size_t backslashes = 0;
+    for (const wchar_t unit : argument) {
+        if (unit == L'\\') {
+            ++backslashes;
+            continue;
+        }
+        quoted.append(unit == L'"' ? 2 * backslashes + 1 : backslashes, L'\\');
+        backslashes = 0;
+        quoted += unit;
+    }
+    quoted.append(2 * backslashes, L'\\');
+    return quoted + L'"';
+}
+
+// The child's end of a stream is inheritable, ours is not.
+void Connect(ChildStream kind, bool isInput, CHandle& ours, CHandle& theirs) {
+    SECURITY_ATTRIBUTES inherit = {sizeof inherit, nullptr, TRUE};
+    if (kind == ChildStream::Null) {
+        theirs = CHandle(CreateFileW(L"NUL", isInput ? GENERIC_READ : GENERIC_WRITE,
+                                     FILE_SHARE_READ | FILE_SHARE_WRITE, &inherit, OPEN_EXISTING, 0,
+                                     nullptr));
+        return;
+    }
+    HANDLE readEnd = nullptr;
+    HANDLE writeEnd = nullptr;
+    if (!CreatePipe(&readEnd, &writeEnd, &inherit, kPipeBytes)) {
+        Fail("pipe");
+    }
+    ours = CHandle(isInput ? writeEnd : readEnd);
+    theirs = CHandle(isInput ? readEnd : writeEnd);
+    SetHandleInformation(ours.Get(), HANDLE_FLAG_INHERIT, 0);
+}
+
+size_t ReadSome(const CHandle& from, void* buffer, size_t size) {
+    DWORD count = 0;
+    const auto wanted = static_cast<DWORD>(std::min(size, kPieceBytes));
+    return ReadFile(from.Get(), buffer, wanted, &count, nullptr) ? count : 0;
+}
+
+} // namespace
+
+struct CProcess::State {
+    CHandle child, input, output, error;
+};
+
+std::filesystem::path ExecutableFile() {
+    std::wstring name(32768, L'\0');
+    name.resize(GetModuleFileNameW(nullptr, name.data(), static_cast<DWORD>(name.size())));
+    return name;
+}
+
+CProcess::CProcess(const std::string& program, const std::vector<std::string>& arguments,
+                   ChildStream input, ChildStream output, ChildStream error)
+    : m_pState(std::make_unique<State>()) {
+    // While a child's ends are inheritable no other start may run: its child would hold them open.
+    static std::mutex starting;
+    const std::lock_guard lock(starting);
+
+    CHandle childInput, childOutput, childError;
+    Connect(input, true, m_pState->input, childInput);
+    Connect(output, false, m_pState->output, childOutput);
+    Connect(error, false, m_pState->error, childError);
+
+    STARTUPINFOW startup = {};
+    startup.cb = sizeof startup;
+    startup.dwFlags = STARTF_USESTDHANDLES;
+    startup.hStdInput = childInput.Get();
+    startup.hStdOutput = childOutput.Get();
+    startup.hStdError = childError.Get();
+
+    std::wstring commandLine = Quote(Wide(program));
+    for (const std::string& argument : arguments) {
+        commandLine += L' ' + Quote(Wide(argument));
+    }
+    PROCESS_INFORMATION info = {};
+    if (!CreateProcessW(nullptr, commandLine.data(), nullptr, nullptr, TRUE,
+                        CREATE_NEW_PROCESS_GROUP, nullptr, nullptr, &startup, &info)) {
+        Fail(program);
+    }
+    CloseHandle(info.hThread);
+    m_pState->child = CHandle(info.hProcess);
+}
+
+CProcess::~CProcess() {
+    Kill();
+    Wait();
+}
+
+size_t CProcess::ReadOutput(void* buffer, size_t size) {
+    return ReadSome(m_pState->output, buffer, size);
+}
+
+size_t CProcess::ReadError(void* buffer, size_t size) {
+    return ReadSome(m_pState->error, buffer, size);
+}
+
+bool CProcess::WriteInput(const void* data, size_t size) {
+    const char* next = static_cast<const char*>(data);
+    while (size > 0) {
+        DWORD count = 0;
+        const auto wanted = static_cast<DWORD>(std::min(size, kPieceBytes));
+        if (!WriteFile(m_pState->input.Get(), next, wanted, &count, nullptr)) {
+            return false;
+        }
+        next += count;
+        size -= count;
+    }
+    return true;
+}
+
+void CProcess::CloseInput() {
+    m_pState->input.Close();
+}
+
+void CProcess::Kill() {
+    TerminateProcess(m_pState->child.Get(), 128);
+}
+
+int CProcess::Wait() {
+    DWORD status = 0;
+    WaitForSingleObject(m_pState->child.Get(), INFINITE);
+    GetExitCodeProcess(m_pState->child.Get(), &status);
+    return static_cast<int>(status);
+}
+
+} // namespace kyv
