@@ -1,0 +1,136 @@
+// Tables and JSON of effects and parameters.
+#include "host/Catalogue.h"
+
+#include <algorithm>
+
+#include <nlohmann/json.hpp>
+
+#include "host/Instance.h"
+#include "host/Names.h"
+#include "host/Text.h"
+#include "host/Values.h"
+
+namespace kyvhost {
+namespace {
+
+using json = nlohmann::ordered_json;
+using Row = std::vector<std::string>;
+
+// Columns as wide as their widest cell, two blanks between.
+std::string TableText(const std::vector<Row>& rows) {
+    std::vector<size_t> widths;
+    for (const Row& row : rows) {
+        widths.resize(std::max(widths.size(), row.size()));
+        for (size_t i = 0; i < row.size(); ++i) {
+            widths[i] = std::max(widths[i], row[i].size());
+        }
+    }
+    std::string text;
+    for (const Row& row : rows) {
+        std::string line;
+        for (size_t i = 0; i < row.size(); ++i) {
+            line += row[i] + std::string(widths[i] - row[i].size() + 2, ' ');
+        }
+        text += line.substr(0, line.find_last_not_of(' ') + 1) + '\n';
+    }
+    return text;
+}
+
+std::string Text(const char* text) {
+    return text ? text : "";
+}
+
+std::string Inputs(const EffectDescriptor& effect) {
+    return std::to_string(effect.properties.inputCount);
+}
+
+json EffectJson(const EffectDescriptor& effect) {
+    return {{"identifier", effect.identifier},
+            {"name", EffectName(effect)},
+            {"shortName", ShortName(effect)},
+            {"subclass", Text(effect.subclass)},
+            {"author", Text(effect.author)},
+            {"vendor", Text(effect.vendor)},
+            {"inputs", effect.properties.inputCount},
+            {"transition", effect.properties.isTransition != 0}};
+}
+
+// A number as a number, anything else as the text that --set takes.
+json ValueJson(const ParamDescriptor& param, const void* value) {
+    if (param.type == ParamType_Float && IsKnownType(param)) {
+        // Through its shortest text, so that 0.2 stays 0.2.
+        return json::parse(FormatValue(param, value), nullptr, false);
+    }
+    if (HasRange(param) && ChoiceLabels(param).empty()) {
+        return static_cast<int64_t>(NumberOf(param, value));
+    }
+    return FormatValue(param, value);
+}
+
+json ParamJson(const ParamDescriptor& param, const void* value) {
+    json entry = {{"key", param.key},
+                  {"name", ParamName(param)},
+                  {"type", TypeName(param)},
+                  {"default", ValueJson(param, value)}};
+    const std::vector<std::string> labels = ChoiceLabels(param);
+    if (!labels.empty()) {
+        entry["choices"] = labels;
+    } else if (HasRange(param)) {
+        entry["minimum"] = ValueJson(param, param.minimum);
+        entry["maximum"] = ValueJson(param, param.maximum);
+    }
+    entry["canAnimate"] = CanAnimate(param);
+    return entry;
+}
+
+} // namespace
+
+std::string ListText(const ModuleDescriptor& module) {
+    std::vector<Row> rows = {{"#", "EFFECT", "NAME", "INPUTS", "PARAMETERS", "IDENTIFIER"}};
+    for (uint32_t i = 0; i < module.effectCount; ++i) {
+        const EffectDescriptor& effect = module.effects[i];
+        rows.push_back({std::to_string(i), ShortName(effect), EffectName(effect), Inputs(effect),
+                        std::to_string(effect.paramCount), effect.identifier});
+    }
+    return TableText(rows);
+}
+
+std::string ListJson(const ModuleDescriptor& module) {
+    json effects = json::array();
+    for (uint32_t i = 0; i < module.effectCount; ++i) {
+        json entry = EffectJson(module.effects[i]);
+        entry["parameters"] = module.effects[i].paramCount;
+        effects.push_back(std::move(entry));
+    }
+    return json{{"formatNumber", module.formatNumber}, {"effects", effects}}.dump(2) + '\n';
+}
+
+std::string InfoText(const EffectDescriptor& effect) {
+    const CInstance instance(effect);
+    std::string text = EffectName(effect) + " (" + ShortName(effect) + ")\n" +
+                       TableText({{"  identifier", effect.identifier},
+                                  {"  category", Text(effect.subclass)},
+                                  {"  author", Text(effect.author)},
+                                  {"  vendor", Text(effect.vendor)},
+                                  {"  inputs", Inputs(effect)}}) +
+                       '\n';
+    std::vector<Row> rows = {{"KEY", "NAME", "TYPE", "DEFAULT", "RANGE"}};
+    for (uint32_t i = 0; i < effect.paramCount; ++i) {
+        const ParamDescriptor& param = effect.params[i];
+        rows.push_back({param.key, ParamName(param), TypeName(param),
+                        FormatValue(param, instance.Value(i)), RangeText(param)});
+    }
+    return text + TableText(rows);
+}
+
+std::string InfoJson(const EffectDescriptor& effect) {
+    const CInstance instance(effect);
+    json entry = EffectJson(effect);
+    entry["parameters"] = json::array();
+    for (uint32_t i = 0; i < effect.paramCount; ++i) {
+        entry["parameters"].push_back(ParamJson(effect.params[i], instance.Value(i)));
+    }
+    return entry.dump(2) + '\n';
+}
+
+} // namespace kyvhost

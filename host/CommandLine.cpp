@@ -1,0 +1,391 @@
+// The command line.
+#include "host/CommandLine.h"
+
+#include <charconv>
+#include <cmath>
+#include <cstdio>
+#include <functional>
+#include <map>
+#include <new>
+#include <optional>
+
+#include <CLI/CLI.hpp>
+
+#include "host/Bench.h"
+#include "host/Catalogue.h"
+#include "host/Gallery.h"
+#include "host/Module.h"
+#include "host/Names.h"
+#include "host/Render.h"
+#include "host/Suggest.h"
+#include "host/Text.h"
+
+namespace kyvhost {
+namespace {
+
+constexpr const char* kFooter =
+    R"(Effects are named by short name, identifier or number, parameters by key or name.
+
+Exit status:
+    0  done
+    1  rendering failed, or the result cannot be written
+    2  wrong use: an option, an effect, a parameter or a value
+    3  an input is missing or cannot be read
+    4  the module cannot be used
+  130  interrupted; nothing is left behind)";
+
+constexpr const char* kRenderFooter =
+    R"(Examples:
+  kyvhost render color-temperature photo.jpg warm.png --set P1=0.5
+  kyvhost render bubble clip.mp4 bubbles.mp4 --set density=0.8
+  kyvhost render alpha-transition a.mp4 both.mp4 --input2 b.mp4 --animate P1=0:1:in-out
+
+Values: numbers, on or off, a choice's label, #RRGGBB, x,y and left,top,right,bottom.
+Times: 5s, 500ms, 2.5 or 1:30.)";
+
+// A whole number from least to most.
+template <class T>
+T ParseWhole(std::string_view what, std::string_view text, T least, T most) {
+    T number = 0;
+    const char* const end = text.data() + text.size();
+    const auto [stop, error] = std::from_chars(text.data(), end, number);
+    if (error != std::errc() || stop != end || number < least || number > most) {
+        throw CUsageError(std::string(what) + ": " + Quoted(text) + " is not a whole number, " +
+                          std::to_string(least) + " to " + std::to_string(most));
+    }
+    return number;
+}
+
+// One of a few words; the value is the place in the list.
+size_t ParseWord(std::string_view what, std::string_view text,
+                 const std::vector<std::string>& words) {
+    for (size_t i = 0; i < words.size(); ++i) {
+        if (words[i] == text) {
+            return i;
+        }
+    }
+    throw CUsageError(std::string(what) + ": " + Quoted(text) + " is not one of " +
+                      Join(words, ", "));
+}
+
+int32_t ParseLevel(std::string_view text) {
+    return ParseWhole<int32_t>("--level", text, 0, 5);
+}
+
+class CCommandLine {
+public:
+    CCommandLine() : m_app("Renders the video effects of a KYV DSP module.", "kyvhost") {
+        m_app.footer(kFooter);
+        m_app.require_subcommand(1);
+        m_app.set_version_flag("--version", "kyvhost " KYV_VERSION);
+        m_app
+            .add_option("--module", m_module,
+                        "the module's file; default: " KYV_MODULE_NAME " beside kyvhost")
+            ->type_name("FILE");
+        m_app.fallthrough();
+        AddList();
+        AddInfo();
+        AddRender();
+        AddBench();
+        AddGallery();
+    }
+
+    void Run(const std::vector<std::string>& arguments) {
+        try {
+            m_app.parse(std::vector<std::string>(arguments.rbegin(), arguments.rend()));
+        } catch (const CLI::Success& wanted) { // help or version
+            m_app.exit(wanted);
+            return;
+        } catch (const CLI::ParseError& error) {
+            if (!m_app.remaining(true).empty()) {
+                RefuseExtra();
+            }
+            throw CUsageError(WithHint(
+                Verb() ? error.what() : "a verb is missing: list, info, render, bench or gallery"));
+        }
+        m_action();
+    }
+
+private:
+    using Action = void (CCommandLine::*)();
+
+    CLI::App* AddVerb(const char* name, const char* description, Action action) {
+        CLI::App* const verb = m_app.add_subcommand(name, description);
+        verb->callback([this, action] { m_action = [this, action] { (this->*action)(); }; });
+        return verb;
+    }
+
+    // An option that a function reads; text that is not given is never read.
+    template <class Read>
+    CLI::Option* AddText(CLI::App* verb, const char* name, const char* type, const char* what,
+                         Read&& read) {
+        return verb
+            ->add_option_function<std::string>(
+                name, [read](const std::string& text) { read(text); }, what)
+            ->type_name(type);
+    }
+
+    void AddEffect(CLI::App* verb) {
+        verb->add_option("EFFECT", m_effect, "the effect; \"kyvhost list\" shows all")
+            ->required()
+            ->type_name("");
+    }
+
+    void AddSettings(CLI::App* verb) {
+        EffectSettings& settings = m_render.settings;
+        verb->add_option("--set", settings.sets, "a parameter's value; repeatable")
+            ->type_name("NAME=VALUE")
+            ->allow_extra_args(false);
+        AddCommonSettings(verb);
+        AddText(verb, "--seed", "N", "random seed that the host hands out",
+                [&settings](const std::string& text) {
+                    settings.seed = ParseWhole<uint32_t>("--seed", text, 0, UINT32_MAX);
+                });
+        AddText(verb, "--aspect", "W:H", "shape of the display; default: the frame's own",
+                [&settings](const std::string& text) {
+                    settings.aspect = ParseAspect("--aspect", text);
+                });
+        AddText(verb, "--preview", "0..1", "show the moment that effects have for previews",
+                [&settings](const std::string& text) {
+                    float fraction = -1;
+                    const char* const end = text.data() + text.size();
+                    const auto [stop, error] = std::from_chars(text.data(), end, fraction);
+                    if (error != std::errc() || stop != end || !(fraction >= 0 && fraction <= 1)) {
+                        throw CUsageError("--preview: " + Quoted(text) +
+                                          " is not a number, 0 to 1");
+                    }
+                    settings.preview = fraction;
+                });
+    }
+
+    void AddCommonSettings(CLI::App* verb) {
+        EffectSettings& settings = m_render.settings;
+        AddText(verb, "--format", "argb|ayuv", "pixel format of the effect's frames; default: argb",
+                [&settings](const std::string& text) {
+                    settings.ayuv = ParseWord("--format", text, {"argb", "ayuv"}) == 1;
+                });
+        AddText(verb, "--threads", "N", "threads granted to the effect; default: 1",
+                [&settings](const std::string& text) {
+                    settings.threads = ParseWhole<uint32_t>("--threads", text, 1, 1024);
+                });
+    }
+
+    void AddLevel(CLI::App* verb) {
+        AddText(verb, "--level", "0..5",
+                "instruction sets: 0 none, 3 SSE2, 4 SSSE3, 5 AVX2; default: 5",
+                [this](const std::string& text) { m_render.settings.level = ParseLevel(text); });
+    }
+
+    void AddJson(CLI::App* verb) { verb->add_flag("--json", m_bJson, "JSON instead of a table"); }
+
+    void AddList() { AddJson(AddVerb("list", "Lists the effects.", &CCommandLine::List)); }
+
+    void AddInfo() {
+        CLI::App* const verb =
+            AddVerb("info", "Shows an effect and its parameters.", &CCommandLine::Info);
+        AddEffect(verb);
+        AddJson(verb);
+    }
+
+    void AddRender() {
+        CLI::App* const verb = AddVerb("render", "Renders a picture or a video through an effect.",
+                                       &CCommandLine::RenderFile);
+        verb->footer(kRenderFooter);
+        AddEffect(verb);
+        verb->add_option("INPUT", m_input, "a PNG or JPEG picture, or a video that ffmpeg reads")
+            ->required()
+            ->type_name("");
+        verb->add_option("OUTPUT", m_output, "a .png picture, or a .mp4, .m4v, .mov or .mkv video")
+            ->required()
+            ->type_name("");
+        AddText(verb, "--input2", "FILE", "the second input of a transition, or the inner picture",
+                [this](const std::string& text) { m_render.input2 = PathOf(text); });
+        AddSettings(verb);
+        AddLevel(verb);
+        verb->add_option("--animate", m_render.animations,
+                         "a parameter that changes over the clip; repeatable")
+            ->type_name("NAME=FROM:TO[:EASING]")
+            ->allow_extra_args(false);
+        AddText(verb, "--easing", "NAME",
+                "of animations: linear, in, out or in-out; default: linear",
+                [this](const std::string& text) { m_render.easing = ParseEasing(text); });
+        AddText(verb, "--time", "TIME", "the moment to show in a picture; default: the middle",
+                [this](const std::string& text) { m_render.time = ParseTime("--time", text); });
+        AddText(verb, "--start", "TIME", "where in the videos to begin",
+                [this](const std::string& text) { m_render.start = ParseTime("--start", text); });
+        AddText(
+            verb, "--duration", "TIME",
+            "length of the clip; default: the shortest video's, or 10s for pictures",
+            [this](const std::string& text) { m_render.duration = ParseTime("--duration", text); });
+        AddText(verb, "--rate", "FPS", "frame rate; default: the video's, or 30 for pictures",
+                [this](const std::string& text) { m_render.rate = ParseRate("--rate", text); });
+        AddText(verb, "--stereo", "sbs|split",
+                "two views side by side: both of the input (sbs), or an input that holds two "
+                "already (split)",
+                [this](const std::string& text) {
+                    m_render.stereo = ParseWord("--stereo", text, {"sbs", "split"}) == 0
+                                          ? Stereo::SideBySide
+                                          : Stereo::Split;
+                });
+        AddText(verb, "--field", "first|second|both", "render only these rows, field by field",
+                [this](const std::string& text) {
+                    const size_t field = ParseWord("--field", text, {"first", "second", "both"});
+                    m_render.settings.firstField = field != 1;
+                    m_render.settings.secondField = field != 0;
+                });
+        AddText(verb, "--codec", "h264|ffv1",
+                "of a video: for watching, or every byte kept in a .mkv; default: h264",
+                [this](const std::string& text) {
+                    m_render.codec = ParseWord("--codec", text, {"h264", "ffv1"}) == 0
+                                         ? VideoCodec::H264
+                                         : VideoCodec::Ffv1;
+                });
+        AddText(verb, "--ffmpeg", "FILE", "the program ffmpeg; ffprobe lies beside it",
+                [this](const std::string& text) { m_render.tools.ffmpeg = text; });
+        verb->add_flag("--quiet,-q", m_render.quiet, "no progress, no notes");
+    }
+
+    void AddBench() {
+        CLI::App* const verb = AddVerb("bench",
+                                       "Measures an effect's time for a frame beside a "
+                                       "memcpy of the frame.",
+                                       &CCommandLine::BenchEffect);
+        AddEffect(verb);
+        AddSettings(verb);
+        AddText(verb, "--level", "0..5", "one level only; default: 0, 3, 4 and 5",
+                [this](const std::string& text) { m_bench.levels = {ParseLevel(text)}; });
+        AddText(verb, "--size", "WxH", "of the frame; default: 1920x1080",
+                [this](const std::string& text) { m_bench.size = ParseSize("--size", text); });
+        AddText(verb, "--frames", "N", "frames a level; default: about two seconds of them",
+                [this](const std::string& text) {
+                    m_bench.rounds = ParseWhole<int>("--frames", text, 1, 1'000'000);
+                });
+        AddJson(verb);
+    }
+
+    void AddGallery() {
+        CLI::App* const verb =
+            AddVerb("gallery", "Renders every effect on two pictures into one contact sheet.",
+                    &CCommandLine::MakeGallery);
+        verb->add_option("OUTPUT", m_output, "a .png picture")->required()->type_name("");
+        verb->add_option("INPUT", m_input, "a PNG or JPEG picture")->required()->type_name("");
+        verb->add_option("INPUT2", m_input2, "another one, for effects with two inputs")
+            ->required()
+            ->type_name("");
+        AddCommonSettings(verb);
+        AddLevel(verb);
+        AddText(verb, "--columns", "N", "pictures a row; default: 5",
+                [this](const std::string& text) {
+                    m_gallery.columns = ParseWhole<uint32_t>("--columns", text, 1, 16);
+                });
+        AddText(verb, "--width", "N", "pixels of one picture; default: 400",
+                [this](const std::string& text) {
+                    m_gallery.tileWidth = ParseWhole<uint32_t>("--width", text, 64, 1920);
+                });
+    }
+
+    CModule Load() const {
+        return CModule(m_module.empty() ? DefaultModuleFile() : PathOf(m_module));
+    }
+
+    void List() {
+        const CModule module = Load();
+        std::fputs((m_bJson ? ListJson : ListText)(module.Descriptor()).c_str(), stdout);
+    }
+
+    void Info() {
+        const CModule module = Load();
+        const EffectDescriptor& effect = FindEffect(module.Descriptor(), m_effect);
+        std::fputs((m_bJson ? InfoJson : InfoText)(effect).c_str(), stdout);
+    }
+
+    void RenderFile() {
+        m_render.effect = m_effect;
+        m_render.input = PathOf(m_input);
+        m_render.output = PathOf(m_output);
+        const CModule module = Load();
+        Render(module.Descriptor(), m_render);
+    }
+
+    void BenchEffect() {
+        m_bench.effect = m_effect;
+        m_bench.settings = m_render.settings;
+        m_bench.json = m_bJson;
+        const CModule module = Load();
+        Bench(module.Descriptor(), m_bench);
+    }
+
+    void MakeGallery() {
+        m_gallery.input = PathOf(m_input);
+        m_gallery.input2 = PathOf(m_input2);
+        m_gallery.output = PathOf(m_output);
+        m_gallery.settings = m_render.settings;
+        const CModule module = Load();
+        Gallery(module.Descriptor(), m_gallery);
+    }
+
+    const CLI::App* Verb() const {
+        const auto verbs = m_app.get_subcommands();
+        return verbs.empty() ? nullptr : verbs.front();
+    }
+
+    std::string WithHint(const std::string& text) const {
+        const CLI::App* const verb = Verb();
+        return text + " (kyvhost " + (verb ? verb->get_name() + " " : "") + "--help)";
+    }
+
+    // What is left over is a mistyped verb or option, or one argument too many.
+    [[noreturn]] void RefuseExtra() const {
+        const CLI::App* const verb = Verb();
+        const std::string extra = m_app.remaining(true).front();
+        std::vector<std::string> names;
+        if (!verb) {
+            for (const CLI::App* candidate : m_app.get_subcommands({})) {
+                names.push_back(candidate->get_name());
+            }
+            throw CUsageError("no verb " + Quoted(extra) + "; the nearest is " +
+                              Nearest(extra, names));
+        }
+        if (!extra.starts_with('-')) {
+            throw CUsageError(WithHint(Quoted(extra) + " is one argument too many"));
+        }
+        for (const CLI::Option* option : verb->get_options()) {
+            if (option->nonpositional()) {
+                names.push_back("--" + option->get_lnames().front());
+            }
+        }
+        names.emplace_back("--module");
+        throw CUsageError("no option " + Quoted(extra.substr(0, extra.find('='))) +
+                          "; the nearest is " + Nearest(extra.substr(0, extra.find('=')), names));
+    }
+
+    CLI::App m_app;
+    std::function<void()> m_action = [] {};
+    std::string m_module, m_effect, m_input, m_input2, m_output;
+    bool m_bJson = false;
+    RenderOptions m_render;
+    BenchOptions m_bench;
+    GalleryOptions m_gallery;
+};
+
+ExitStatus Complain(ExitStatus status, const std::string& text) {
+    std::fprintf(stderr, "kyvhost: %s\n", text.c_str());
+    return status;
+}
+
+} // namespace
+
+ExitStatus RunCommandLine(const std::vector<std::string>& arguments) {
+    try {
+        CCommandLine().Run(arguments);
+        return ExitStatus::Done;
+    } catch (const CHostError& error) {
+        return Complain(error.Status(), error.what());
+    } catch (const std::bad_alloc&) {
+        return Complain(ExitStatus::RenderingFailed, "there is not enough memory");
+    } catch (const std::exception& error) {
+        return Complain(ExitStatus::RenderingFailed, error.what());
+    }
+}
+
+} // namespace kyvhost

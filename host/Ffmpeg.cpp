@@ -1,0 +1,86 @@
+// A running ffmpeg.
+#include "host/Ffmpeg.h"
+
+#include <system_error>
+#include <utility>
+
+#include "host/Text.h"
+
+namespace kyvhost {
+namespace {
+
+constexpr size_t kLinesKept = 8;
+
+// Shells the system's error: "cannot be started" is what the user has to mend.
+template <class Start>
+auto Started(const std::string& program, ExitStatus status, Start&& start) {
+    try {
+        return start();
+    } catch (const std::system_error& error) {
+        throw CHostError(status, "videos need " + program + ", which cannot be started (" +
+                                     error.code().message() +
+                                     "); install ffmpeg or name it with --ffmpeg FILE");
+    }
+}
+
+} // namespace
+
+CFfmpeg::CFfmpeg(const std::string& program, const std::vector<std::string>& arguments,
+                 kyv::ChildStream input, kyv::ChildStream output, ExitStatus status)
+    : m_process(Started(program, status,
+                        [&] {
+                            return kyv::CProcess(program, arguments, input, output,
+                                                 kyv::ChildStream::Pipe);
+                        })),
+      m_collector([this] { CollectLines(); }), m_guard([this] {
+          m_process.Kill();
+          m_process.Wait();
+      }) {}
+
+CFfmpeg::~CFfmpeg() {
+    m_process.Kill();
+    if (m_collector.joinable()) {
+        m_collector.join();
+    }
+}
+
+int CFfmpeg::Wait() {
+    const int status = m_process.Wait();
+    if (m_collector.joinable()) {
+        m_collector.join();
+    }
+    return status;
+}
+
+std::string CFfmpeg::LastLine() const {
+    for (auto line = m_lines.rbegin(); line != m_lines.rend(); ++line) {
+        if (*line != "Conversion failed!") { // follows every error and explains none
+            return *line;
+        }
+    }
+    return {};
+}
+
+void CFfmpeg::CollectLines() {
+    std::string line;
+    char buffer[512];
+    while (const size_t count = m_process.ReadError(buffer, sizeof buffer)) {
+        for (const char c : std::string_view(buffer, count)) {
+            if (c != '\n' && c != '\r') {
+                line += c;
+                continue;
+            }
+            if (!line.empty()) {
+                m_lines.push_back(std::exchange(line, {}));
+            }
+            if (m_lines.size() > kLinesKept) {
+                m_lines.pop_front();
+            }
+        }
+    }
+    if (!line.empty()) {
+        m_lines.push_back(line);
+    }
+}
+
+} // namespace kyvhost

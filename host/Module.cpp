@@ -1,0 +1,101 @@
+// Loading the module.
+#include "host/Module.h"
+
+#include <memory>
+
+#include "host/ExitStatus.h"
+#include "host/Hex.h"
+#include "host/Text.h"
+#include "platform/Library.h"
+#include "platform/Process.h"
+
+namespace kyvhost {
+namespace {
+
+namespace fs = std::filesystem;
+
+[[noreturn]] void Fail(const std::string& text) {
+    throw CHostError(ExitStatus::ModuleNotUsable, text);
+}
+
+template <class Function>
+Function FindExport(KyvModuleHandle library, const char* name, const fs::path& file) {
+    const auto function = reinterpret_cast<Function>(kyv::FindSymbol(library, name));
+    if (!function) {
+        Fail(TextOf(file) + " is not a KYV DSP module: it does not export " + name);
+    }
+    return function;
+}
+
+} // namespace
+
+fs::path DefaultModuleFile() {
+    const fs::path folder = kyv::ExecutableFile().parent_path();
+    for (const fs::path& place : {folder, folder / "../module", folder / "../lib"}) {
+        const fs::path file = place / KYV_MODULE_NAME;
+        std::error_code error;
+        if (fs::exists(file, error)) {
+            return file.lexically_normal();
+        }
+    }
+    Fail("no " KYV_MODULE_NAME " beside " + TextOf(folder / "kyvhost") +
+         "; name the module with --module FILE");
+}
+
+CModule::CModule(const fs::path& file) : m_file(fs::absolute(file).lexically_normal()) {
+    std::error_code error;
+    if (!fs::is_regular_file(m_file, error)) {
+        Fail("no module " + TextOf(file) +
+             (fs::exists(m_file, error) ? ": not a file" : ": there is no such file"));
+    }
+    using Library = std::unique_ptr<void, decltype(&kyv::CloseLibrary)>;
+    Library library(kyv::OpenLibrary(m_file.native()), &kyv::CloseLibrary);
+    if (!library) {
+        Fail(TextOf(file) + " cannot be loaded: it is no library for this system, or a library "
+                            "that it needs is missing");
+    }
+    const auto init = FindExport<KyvInitModuleFunction>(library.get(), KYV_INIT_MODULE_NAME, file);
+    m_pDeInit = FindExport<KyvDeInitModuleFunction>(library.get(), KYV_DEINIT_MODULE_NAME, file);
+    const KyvStatus status = init(&m_pDescriptor);
+    if (status != KYV_OK || !m_pDescriptor) {
+        Fail(TextOf(file) + " refuses to start: " KYV_INIT_MODULE_NAME " gives " + Hex(status));
+    }
+    try {
+        Check();
+    } catch (...) {
+        m_pDeInit();
+        throw;
+    }
+    m_library = library.release();
+}
+
+CModule::~CModule() {
+    m_pDeInit();
+    kyv::CloseLibrary(m_library);
+}
+
+void CModule::Check() const {
+    if (m_pDescriptor->formatNumber != kKyvFormatNumber) {
+        Fail(TextOf(m_file) + " has interface format " +
+             std::to_string(m_pDescriptor->formatNumber) + "; this host needs " +
+             std::to_string(kKyvFormatNumber));
+    }
+    for (uint32_t i = 0; i < m_pDescriptor->effectCount; ++i) {
+        const EffectDescriptor& effect = m_pDescriptor->effects[i];
+        const EffectCallbacks& calls = effect.callbacks;
+        if (!effect.identifier || !effect.nameKey || (effect.paramCount && !effect.params) ||
+            !calls.InitInstance || !calls.DestroyInstance || !calls.SetInputFrame ||
+            !calls.ProcessFrame || !calls.BeginProcessing || !calls.EndProcessing) {
+            Fail(TextOf(m_file) + " is broken: the record of effect " + std::to_string(i) +
+                 " lacks a name or a callback");
+        }
+        for (uint32_t j = 0; j < effect.paramCount; ++j) {
+            if (!effect.params[j].key || !effect.params[j].nameKey) {
+                Fail(TextOf(m_file) + " is broken: parameter " + std::to_string(j) + " of effect " +
+                     std::to_string(i) + " has no name");
+            }
+        }
+    }
+}
+
+} // namespace kyvhost

@@ -1,0 +1,224 @@
+// Effects and parameters by name.
+#include "host/Names.h"
+
+#include <algorithm>
+#include <charconv>
+
+#include "host/ExitStatus.h"
+#include "host/Suggest.h"
+#include "host/Text.h"
+
+namespace kyvhost {
+namespace {
+
+bool IsUpper(char c) {
+    return c >= 'A' && c <= 'Z';
+}
+bool IsLower(char c) {
+    return c >= 'a' && c <= 'z';
+}
+bool IsDigit(char c) {
+    return c >= '0' && c <= '9';
+}
+
+void DropPrefix(std::string_view& text, std::string_view prefix) {
+    if (text.starts_with(prefix)) {
+        text.remove_prefix(prefix.size());
+    }
+}
+
+// "Vi", "Pi", "Tr" or "Co" of a key; empty when it has none.
+std::string_view FamilyTag(std::string_view key) {
+    DropPrefix(key, "IDS_");
+    DropPrefix(key, "DSP_");
+    return key.size() > 3 && IsUpper(key[0]) && IsLower(key[1]) && key[2] == '_' ? key.substr(0, 2)
+                                                                                 : "";
+}
+
+// Whether a word ends before text[i]: "min|Size", "3D|Depth", "Color|1".
+bool WordEndsBefore(std::string_view text, size_t i) {
+    const char last = text[i - 1];
+    if (IsUpper(text[i])) {
+        const bool newWord = i + 1 < text.size() && IsLower(text[i + 1]);
+        return IsLower(last) || (IsUpper(last) && newWord);
+    }
+    return IsDigit(text[i]) && IsLower(last);
+}
+
+// Whether text is a part of the name that can stand for it: shorter ones are in too many.
+bool IsPart(std::string_view text, std::string_view name) {
+    constexpr size_t kLeastLetters = 3;
+    const std::string part = Normalized(text);
+    return part.size() >= kLeastLetters && Normalized(name).find(part) != std::string::npos;
+}
+
+std::string_view WithoutLabels(std::string_view nameKey) {
+    return nameKey.substr(0, nameKey.find(';'));
+}
+
+// The name as its key alone gives it: "Temperature".
+std::string BareEffectName(const EffectDescriptor& effect) {
+    std::string words = WordsOfKey(effect.nameKey);
+    // A number at the end counts revisions of the effect and tells a user nothing.
+    while (!words.empty() && (IsDigit(words.back()) || words.back() == ' ')) {
+        words.pop_back();
+    }
+    return words;
+}
+
+} // namespace
+
+std::string WordsOfKey(std::string_view key) {
+    key = WithoutLabels(key);
+    DropPrefix(key, "IDS_");
+    DropPrefix(key, "DSP_");
+    if (!FamilyTag(key).empty()) {
+        key.remove_prefix(3);
+    }
+    DropPrefix(key, "Param_");
+    for (const std::string_view ending : {"_Name", "_Desc"}) {
+        if (key.ends_with(ending)) {
+            key.remove_suffix(ending.size());
+        }
+    }
+    std::string words;
+    for (size_t i = 0; i < key.size(); ++i) {
+        if (key[i] == '_') {
+            words += ' ';
+            continue;
+        }
+        const bool inside = !words.empty() && words.back() != ' ';
+        const bool newWord = inside && WordEndsBefore(key, i);
+        words += newWord ? " " : "";
+        // Capitals at the start and in "A", "X" or "3D" stay.
+        const bool plainWord = i + 1 < key.size() && IsLower(key[i + 1]);
+        words += !words.empty() && plainWord ? Lower(key.substr(i, 1)) : std::string(1, key[i]);
+    }
+    return words;
+}
+
+std::string ParamName(const ParamDescriptor& param) {
+    return WordsOfKey(param.nameKey);
+}
+
+std::string EffectName(const EffectDescriptor& effect) {
+    // Keys shorten what the family says; outside its family's menu the name needs it back.
+    const std::string bare = BareEffectName(effect);
+    const std::string_view family = FamilyTag(effect.nameKey);
+    std::string name = bare;
+    if (family == "Co" && bare.find(' ') == std::string::npos) {
+        name = "Color " + Lower(bare);
+    } else if (family == "Tr" && bare.find("transition") == std::string::npos) {
+        name = bare + " transition";
+    } else if (family == "Pi") {
+        name = bare + " picture-in-picture";
+    }
+    return name;
+}
+
+std::string ShortName(const EffectDescriptor& effect) {
+    std::string name = Lower(EffectName(effect));
+    std::replace(name.begin(), name.end(), ' ', '-');
+    return name;
+}
+
+std::vector<std::string> ChoiceLabels(const ParamDescriptor& param) {
+    std::vector<std::string> labels = Split(param.nameKey, ';');
+    labels.erase(labels.begin());
+    return labels;
+}
+
+std::string Normalized(std::string_view text) {
+    std::string normal;
+    for (const char c : Lower(text)) {
+        if (IsLower(c) || IsDigit(c) || static_cast<unsigned char>(c) >= 0x80) {
+            normal += c;
+        }
+    }
+    for (size_t at = 0; (at = normal.find("colour", at)) != std::string::npos;) {
+        normal.erase(at + 4, 1);
+    }
+    return normal;
+}
+
+const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text) {
+    uint32_t index = 0;
+    const char* const end = text.data() + text.size();
+    if (const auto [stop, error] = std::from_chars(text.data(), end, index);
+        error == std::errc() && stop == end) {
+        if (index < module.effectCount) {
+            return module.effects[index];
+        }
+        throw CUsageError("no effect " + std::string(text) + "; the indices are 0 to " +
+                          std::to_string(module.effectCount - 1));
+    }
+    std::vector<std::string> names, parts;
+    const EffectDescriptor* found = nullptr;
+    for (uint32_t i = 0; i < module.effectCount; ++i) {
+        const EffectDescriptor& effect = module.effects[i];
+        for (const std::string& name :
+             {ShortName(effect), Lower(BareEffectName(effect)), std::string(effect.identifier)}) {
+            if (Normalized(name) == Normalized(text)) {
+                return effect;
+            }
+            names.push_back(name);
+        }
+        if (IsPart(text, ShortName(effect))) {
+            found = &effect;
+            parts.push_back(ShortName(effect));
+        }
+    }
+    if (parts.size() == 1) {
+        return *found;
+    }
+    if (parts.size() > 1) {
+        throw CUsageError("several effects are called " + Quoted(text) + ": " + Join(parts, ", "));
+    }
+    throw CUsageError("no effect " + Quoted(text) + "; the nearest is " +
+                      Quoted(Nearest(text, names)) + " (kyvhost list shows all)");
+}
+
+uint32_t FindParam(const EffectDescriptor& effect, std::string_view text) {
+    struct Candidates {
+        uint32_t last = 0;
+        std::vector<std::string> keys;
+        void Add(uint32_t index, const char* key) {
+            last = index;
+            keys.emplace_back(key);
+        }
+    };
+    Candidates whole, parts;
+    std::vector<std::string> names;
+    for (uint32_t i = 0; i < effect.paramCount; ++i) {
+        const ParamDescriptor& param = effect.params[i];
+        const std::string name = ParamName(param);
+        if (Normalized(param.key) == Normalized(text)) {
+            return i;
+        }
+        if (Normalized(name) == Normalized(text)) {
+            whole.Add(i, param.key);
+        } else if (IsPart(text, name)) {
+            parts.Add(i, param.key);
+        }
+        names.emplace_back(param.key);
+        names.push_back(Lower(name));
+    }
+    for (const Candidates& candidates : {whole, parts}) {
+        if (candidates.keys.size() == 1) {
+            return candidates.last;
+        }
+        if (candidates.keys.size() > 1) {
+            throw CUsageError("several parameters of " + ShortName(effect) + " are called " +
+                              Quoted(text) +
+                              "; name one by its key: " + Join(candidates.keys, ", "));
+        }
+    }
+    if (names.empty()) {
+        throw CUsageError(ShortName(effect) + " has no parameters");
+    }
+    throw CUsageError(ShortName(effect) + " has no parameter " + Quoted(text) +
+                      "; the nearest is " + Quoted(Nearest(text, names)) + " (kyvhost info " +
+                      ShortName(effect) + " shows all)");
+}
+
+} // namespace kyvhost

@@ -1,0 +1,43 @@
+// Effects and parameters by the names that people use.
+//
+// The records hold string-table keys, and names are read off them: the words of
+// "IDS_Vi_Param_BubbleMinSize_Name" are "Bubble min size".
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "module/HostInterface.h"
+
+namespace kyvhost {
+
+// The words of a key, without its prefix, tags, ending and choice labels.
+std::string WordsOfKey(std::string_view key);
+
+// "Bubble min size"
+std::string ParamName(const ParamDescriptor& param);
+
+// "Color temperature"
+std::string EffectName(const EffectDescriptor& effect);
+
+// "color-temperature", for the command line
+std::string ShortName(const EffectDescriptor& effect);
+
+// The labels that follow the name key of a choice list.
+std::vector<std::string> ChoiceLabels(const ParamDescriptor& param);
+
+// Letters and digits only, in lower case, "colour" as "color": what is equal after this is the
+// same name.
+std::string Normalized(std::string_view text);
+
+// By identifier, index, name, short name or a part of a name that no other effect has. Throws
+// CUsageError with the nearest name.
+const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text);
+
+// The index by key, name or a part of a name that no other parameter has. Throws CUsageError with
+// the nearest one, or with the keys among which a name leaves the choice.
+uint32_t FindParam(const EffectDescriptor& effect, std::string_view text);
+
+} // namespace kyvhost

@@ -1,0 +1,45 @@
+// The nearest name.
+#include "host/Suggest.h"
+
+#include <algorithm>
+
+#include "host/Names.h"
+
+namespace kyvhost {
+
+size_t EditDistance(std::string_view a, std::string_view b) {
+    // Three rows of the usual table; a swap looks two rows back.
+    std::vector<size_t> before, above(b.size() + 1), row(b.size() + 1);
+    for (size_t j = 0; j <= b.size(); ++j) {
+        row[j] = j;
+    }
+    for (size_t i = 1; i <= a.size(); ++i) {
+        before = std::move(above);
+        above = std::move(row);
+        row.assign(b.size() + 1, i);
+        for (size_t j = 1; j <= b.size(); ++j) {
+            row[j] = std::min(
+                {above[j] + 1, row[j - 1] + 1, above[j - 1] + (a[i - 1] == b[j - 1] ? 0 : 1)});
+            if (i > 1 && j > 1 && a[i - 1] == b[j - 2] && a[i - 2] == b[j - 1]) {
+                row[j] = std::min(row[j], before[j - 2] + 1);
+            }
+        }
+    }
+    return row[b.size()];
+}
+
+std::string Nearest(std::string_view text, const std::vector<std::string>& candidates) {
+    const std::string wanted = Normalized(text);
+    std::string nearest;
+    size_t best = static_cast<size_t>(-1);
+    for (const std::string& candidate : candidates) {
+        const size_t distance = EditDistance(wanted, Normalized(candidate));
+        if (distance < best) {
+            best = distance;
+            nearest = candidate;
+        }
+    }
+    return nearest;
+}
+
+} // namespace kyvhost

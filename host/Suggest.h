@@ -1,0 +1,16 @@
+// "Did you mean": the nearest of a list of names.
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace kyvhost {
+
+// The number of letters to insert, delete, change or swap with their neighbour.
+size_t EditDistance(std::string_view a, std::string_view b);
+
+// The candidate nearest to text by Normalized form, the first of several; empty for no candidates.
+std::string Nearest(std::string_view text, const std::vector<std::string>& candidates);
+
+} // namespace kyvhost
