@@ -58,16 +58,14 @@ void RgbToLuma(uint8_t r, uint8_t g, uint8_t b, uint8_t* luma) {
 }
 
 void RgbToYuv(uint32_t r, uint32_t g, uint32_t b, uint32_t* y, uint32_t* u, uint32_t* v) {
-    const kyv::YuvTriple yuv =
-        kyv::YuvOf(static_cast<int32_t>(r), static_cast<int32_t>(g), static_cast<int32_t>(b));
+    const kyv::YuvTriple yuv = kyv::YuvOf(r, g, b);
     *y = static_cast<uint32_t>(yuv.y);
     *u = static_cast<uint32_t>(yuv.u);
     *v = static_cast<uint32_t>(yuv.v);
 }
 
 void YuvToRgb(uint32_t y, uint32_t u, uint32_t v, uint32_t* r, uint32_t* g, uint32_t* b) {
-    const kyv::RgbTriple rgb =
-        kyv::RgbOf(static_cast<int32_t>(y), static_cast<int32_t>(u), static_cast<int32_t>(v));
+    const kyv::RgbTriple rgb = kyv::RgbOf(y, u, v);
     *r = static_cast<uint32_t>(rgb.r);
     *g = static_cast<uint32_t>(rgb.g);
     *b = static_cast<uint32_t>(rgb.b);

@@ -137,7 +137,7 @@ public:
     void ToGray();
     void ToGray(CImageByte& destination) const;
 
-    // Hue, saturation and lightness as bytes; 43690 / 256 = 170 is the hue of greys.
+    // Hue, saturation and lightness as bytes; 170 is the hue of greys.
     void ToHSL(CImageByte& hue, CImageByte& saturation, CImageByte& lightness) const;
     // Sets B, G and R; alpha is kept.
     void FromHSL(const CImageByte& hue, const CImageByte& saturation, const CImageByte& lightness);
