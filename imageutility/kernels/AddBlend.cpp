@@ -29,6 +29,8 @@ void AddBlendWithAlpha_scalar(uint8_t* dst, const uint8_t* src, size_t count, ui
 
 constinit const KernelTable<AddBlendRow> kAddBlend = {
     .scalar = AddBlend_scalar,
+    .sse2 = KYV_VECTOR_FORM(AddBlend_sse2),
+    .avx2 = KYV_VECTOR_FORM(AddBlend_avx2),
 };
 
 // Serves levels below the vector forms only.

@@ -17,6 +17,8 @@ void AlphaBlend_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_t o
 
 constinit const KernelTable<AlphaBlendRow> kAlphaBlend = {
     .scalar = AlphaBlend_scalar,
+    .sse2 = KYV_VECTOR_FORM(AlphaBlend_sse2),
+    .avx2 = KYV_VECTOR_FORM(AlphaBlend_avx2),
 };
 
 } // namespace kyv

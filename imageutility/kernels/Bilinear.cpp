@@ -32,10 +32,16 @@ void Lerp_scalar(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_
 
 constinit const KernelTable<BilinearRow> kBilinear = {
     .scalar = Bilinear_scalar,
+    .sse2 = KYV_VECTOR_FORM(Bilinear_sse2),
+    .ssse3 = KYV_VECTOR_FORM(Bilinear_ssse3),
+    .avx2 = KYV_VECTOR_FORM(Bilinear_avx2),
 };
 
 constinit const KernelTable<LerpRow> kLerp = {
     .scalar = Lerp_scalar,
+    .sse2 = KYV_VECTOR_FORM(Lerp_sse2),
+    .ssse3 = KYV_VECTOR_FORM(Lerp_ssse3),
+    .avx2 = KYV_VECTOR_FORM(Lerp_avx2),
 };
 
 } // namespace kyv

@@ -26,8 +26,17 @@ using LerpRow = void (*)(uint8_t* dst, const uint8_t* upper, const uint8_t* lowe
 
 void Bilinear_scalar(uint8_t* dst, const uint8_t* src, size_t count,
                      const BilinearColumns& columns);
+void Bilinear_sse2(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns);
+void Bilinear_ssse3(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns);
+void Bilinear_avx2(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns);
 void Lerp_scalar(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
                  uint32_t fraction);
+void Lerp_sse2(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
+               uint32_t fraction);
+void Lerp_ssse3(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
+                uint32_t fraction);
+void Lerp_avx2(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
+               uint32_t fraction);
 
 extern const KernelTable<BilinearRow> kBilinear;
 extern const KernelTable<LerpRow> kLerp;

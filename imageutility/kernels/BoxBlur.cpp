@@ -29,10 +29,12 @@ void BoxAverage_scalar(uint8_t* dst, const uint32_t* sums, size_t count,
 
 constinit const KernelTable<BoxColumnsRow> kBoxColumns = {
     .scalar = BoxColumns_scalar,
+    .avx2 = KYV_VECTOR_FORM(BoxColumns_avx2),
 };
 
 constinit const KernelTable<BoxAverageRow> kBoxAverage = {
     .scalar = BoxAverage_scalar,
+    .avx2 = KYV_VECTOR_FORM(BoxAverage_avx2),
 };
 
 } // namespace kyv

@@ -16,30 +16,38 @@ using BoxColumnsRow = void (*)(uint32_t* sums, const uint8_t* enter, const uint8
 
 // The windows of one row.
 struct BoxWindows {
-    int32_t radius;
-    // For every pixel, how many pixels are inside its window, and what AverageScale gives for it.
+    int32_t radius; // 1 to kBoxRadiusMax
+    // For every pixel, how many pixels are inside its window, and AverageScale of that. From radius
+    // to count - radius, where whole windows fit, all are alike.
     const int32_t* areas;
     const float* scales;
 };
 
 // count averages of 4 channels, each the window's sum over its area, truncated. sums points at the
-// first pixel's column; radius + 1 columns of zeros lie before it and after the last one. The sum
-// of a window must fit in 32 bits, for which a radius up to kBoxRadiusMax is sure.
+// first pixel's column; radius + 1 columns of zeros lie before it and after the last one.
 using BoxAverageRow = void (*)(uint8_t* dst, const uint32_t* sums, size_t count,
                                const BoxWindows& windows);
 
-// (2 * 2051 + 1)^2 * 255 is the last that 32 bits hold.
-inline constexpr int32_t kBoxRadiusMax = 2051;
+// (2 * 1450 + 1)^2 * 255 is the largest sum of a window that a signed 32-bit number holds.
+inline constexpr int32_t kBoxRadiusMax = 1450;
 
-// A reciprocal for vector forms, a little below 2 / area. Half a window's sum, made a float, times
-// this and truncated is the average or 1 less: the relative error is above -6 * 2^-24, which is
-// less than 1 in 255, and below 0. The remainder tells which it is.
+// A little less than 1 / area, for vector forms: the sum in single precision times this, truncated,
+// is the average or 1 less, and the remainder tells which. Each of conversion, reciprocal and
+// product errs by at most 2^-24 of the value, together less than is taken off here; and 7 * 2^-24
+// of 255 is less than 1.
 constexpr float AverageScale(int32_t area) {
-    return 2.0F / static_cast<float>(area) * (1.0F - 0x1p-22F);
+    return 1.0F / static_cast<float>(area) * (1.0F - 0x1p-22F);
 }
 
+// Up to this area of a window, (sum + 0.5) * (1 / area) truncates to the average in single
+// precision. sum + 0.5 is exact, and at least 0.5 / area, 3.10e-5, away from where the integers
+// change; reciprocal and product err by at most 2^-23 of 255.1, 3.05e-5.
+inline constexpr int32_t kSmallArea = 127 * 127;
+
 void BoxColumns_scalar(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
+void BoxColumns_avx2(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
 void BoxAverage_scalar(uint8_t* dst, const uint32_t* sums, size_t count, const BoxWindows& windows);
+void BoxAverage_avx2(uint8_t* dst, const uint32_t* sums, size_t count, const BoxWindows& windows);
 
 extern const KernelTable<BoxColumnsRow> kBoxColumns;
 extern const KernelTable<BoxAverageRow> kBoxAverage;

@@ -1,0 +1,70 @@
+// Bilinear resizing with AVX2, eight pixels a step.
+#include "imageutility/kernels/Bilinear.h"
+
+#include <immintrin.h>
+
+namespace kyv {
+namespace {
+
+// Two neighbour pairs, eight bytes each.
+inline __m128i LoadPairs(const uint8_t* src, const int32_t* left) {
+    const auto* first = reinterpret_cast<const __m128i*>(src + static_cast<ptrdiff_t>(left[0]) * 4);
+    const auto* second = reinterpret_cast<const double*>(src + static_cast<ptrdiff_t>(left[1]) * 4);
+    return _mm_castpd_si128(_mm_loadh_pd(_mm_castsi128_pd(_mm_loadl_epi64(first)), second));
+}
+
+// Four pixels less 128, 16 bits a channel: pairs 0, 1 and 4, 5 of those from left on. The weights
+// go up to 128, which only the unsigned operand holds, so the pixels are the signed one.
+inline __m256i Interpolate(const uint8_t* src, const int32_t* left, __m256i weights) {
+    const __m256i interleave = _mm256_broadcastsi128_si256(
+        _mm_setr_epi8(0, 4, 1, 5, 2, 6, 3, 7, 8, 12, 9, 13, 10, 14, 11, 15));
+    const __m256i pairs = _mm256_inserti128_si256(_mm256_castsi128_si256(LoadPairs(src, left)),
+                                                  LoadPairs(src, left + 4), 1);
+    const __m256i centered = _mm256_xor_si256(pairs, _mm256_set1_epi8(-128));
+    return _mm256_srai_epi16(
+        _mm256_maddubs_epi16(weights, _mm256_shuffle_epi8(centered, interleave)), 7);
+}
+
+} // namespace
+
+void Bilinear_avx2(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns) {
+    const __m256i spreadFirst =
+        _mm256_setr_epi8(0, 1, 0, 1, 0, 1, 0, 1, 2, 3, 2, 3, 2, 3, 2, 3, 8, 9, 8, 9, 8, 9, 8, 9, 10,
+                         11, 10, 11, 10, 11, 10, 11);
+    const __m256i spreadSecond = _mm256_add_epi8(spreadFirst, _mm256_set1_epi8(4));
+    size_t i = 0;
+    for (; i + 8 <= count; i += 8) {
+        const __m256i weights = _mm256_broadcastsi128_si256(
+            _mm_loadu_si128(reinterpret_cast<const __m128i*>(columns.weights + 2 * i)));
+        const __m256i first =
+            Interpolate(src, columns.left + i, _mm256_shuffle_epi8(weights, spreadFirst));
+        const __m256i second =
+            Interpolate(src, columns.left + i + 2, _mm256_shuffle_epi8(weights, spreadSecond));
+        _mm256_storeu_si256(
+            reinterpret_cast<__m256i*>(dst + i * 4),
+            _mm256_xor_si256(_mm256_packs_epi16(first, second), _mm256_set1_epi8(-128)));
+    }
+    Bilinear_scalar(dst + i * 4, src, count - i, {columns.left + i, columns.weights + 2 * i});
+}
+
+void Lerp_avx2(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
+               uint32_t fraction) {
+    // From a fraction of 1 on both weights fit in signed bytes.
+    size_t i = 0;
+    if (fraction != 0) {
+        const __m256i weights =
+            _mm256_set1_epi16(static_cast<short>((fraction << 8) | (128 - fraction)));
+        for (; i + 8 <= count; i += 8) {
+            const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(upper + i * 4));
+            const __m256i b = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(lower + i * 4));
+            const __m256i low = _mm256_maddubs_epi16(_mm256_unpacklo_epi8(a, b), weights);
+            const __m256i high = _mm256_maddubs_epi16(_mm256_unpackhi_epi8(a, b), weights);
+            _mm256_storeu_si256(
+                reinterpret_cast<__m256i*>(dst + i * 4),
+                _mm256_packus_epi16(_mm256_srli_epi16(low, 7), _mm256_srli_epi16(high, 7)));
+        }
+    }
+    Lerp_scalar(dst + i * 4, upper + i * 4, lower + i * 4, count - i, fraction);
+}
+
+} // namespace kyv
