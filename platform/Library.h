@@ -29,7 +29,10 @@ NativeString AbbreviatedLanguageName();
 // True for anything that has attributes, a folder included.
 bool FileExists(const NativeString& path);
 
-// Null when the library cannot be loaded.
+// The file name of a library: "Name.dll" on Windows, "libName.so" on Linux.
+NativeString SharedLibraryName(const char* name);
+
+// Null when the library cannot be loaded. A bare file name is looked for where the system looks.
 LibraryHandle OpenLibrary(const NativeString& path);
 
 // Null is allowed and does nothing.

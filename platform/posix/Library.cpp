@@ -102,6 +102,10 @@ bool FileExists(const NativeString& path) {
     return stat(path.c_str(), &attributes) == 0;
 }
 
+NativeString SharedLibraryName(const char* name) {
+    return "lib" + std::string(name) + ".so";
+}
+
 LibraryHandle OpenLibrary(const NativeString& path) {
     return dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
 }

@@ -29,6 +29,10 @@ bool FileExists(const NativeString& path) {
     return GetFileAttributesW(path.c_str()) != INVALID_FILE_ATTRIBUTES;
 }
 
+NativeString SharedLibraryName(const char* name) {
+    return std::filesystem::path(std::string(name) + ".dll").native();
+}
+
 LibraryHandle OpenLibrary(const NativeString& path) {
     return LoadLibraryW(path.c_str());
 }

@@ -1,0 +1,150 @@
+// The callbacks of the bubble effects.
+#include "effects/particle/Bubble.h"
+
+#include <algorithm>
+#include <iterator>
+#include <memory>
+
+#include "effects/particle/ParticleFrame.h"
+#include "effects/particle/ParticleFxBubble.h"
+#include "imageutility/Bitmap.h"
+
+namespace kyv {
+namespace {
+
+using KYVImageUtility::CImageARGB;
+using KYVImageUtility::CImageAYUV;
+
+constexpr uint16_t kBodyId = 141;
+constexpr uint16_t kMiniatureMaskId = 142;
+constexpr uint16_t kLensMaskId = 143;
+
+constexpr PreviewSpan kPreview = {10000.0F, 15000.0F};
+
+void Release(BubbleInstance& instance) {
+    delete instance.mask;
+    instance.mask = nullptr;
+    delete instance.body;
+    instance.body = nullptr;
+    delete instance.particles;
+    instance.particles = nullptr;
+}
+
+void Begin(EffectContext& context, BubbleInstance& instance, uint16_t maskId) {
+    context.requestB = 1;
+    Release(instance); // a host may prepare twice
+    std::fill(std::begin(instance.params), std::end(instance.params), 0.0F);
+
+    auto particles = std::make_unique<CParticleFxBubble>();
+    auto body = std::make_unique<CImageARGB>();
+    auto mask = std::make_unique<CImageARGB>();
+    body->SetCpuLevel(context.cpuLevel);
+    if (context.descriptor && context.descriptor->module) {
+        const KyvModuleHandle module = context.descriptor->module->ModuleHandle;
+        LoadPngResource(*body, module, "PNG", kBodyId);
+        LoadPngResource(*mask, module, "PNG", maskId);
+    }
+    if (context.pixelFormat == PixelFormat_Ayuv && body->GetBuffer()) {
+        CImageAYUV converted(body->GetBuffer(), body->GetWidth(), body->GetHeight(),
+                             body->GetPitch());
+        body->ToAYUV(converted); // in place
+    }
+    instance.particles = particles.release();
+    instance.body = body.release();
+    instance.mask = mask.release();
+}
+
+bool ReadParams(const EffectContext& context, BubbleInstance& instance) {
+    const CParamReader reader(context);
+    const float params[] = {
+        ReadWithin(reader, 0, 0.0F, 1.0F),
+        ReadWithin(reader, 1, 0.0F, 1.0F),
+        ReadWithin(reader, 2, 0.0F, 1.0F),
+        ReadWithin(reader, 3, -1.0F, 1.0F),
+    };
+    const bool changed =
+        !std::equal(std::begin(params), std::end(params), std::begin(instance.params));
+    std::copy(std::begin(params), std::end(params), std::begin(instance.params));
+    return changed;
+}
+
+KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefractive) {
+    instance.output = context.frame;
+    if (!instance.particles || !instance.body || !instance.body->GetBuffer() || !instance.mask ||
+        !instance.mask->GetBuffer()) {
+        return KYV_OK; // a picture is missing: the frame stays as the host supplied it
+    }
+    FrameGeometry geometry;
+    if (!instance.input || !instance.output || !GetFrameGeometry(context, geometry)) {
+        return KYV_FAIL;
+    }
+    CParticleFxBubble& particles = *instance.particles;
+    if (ReadParams(context, instance)) {
+        particles.ClearSnapshots();
+    }
+    const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
+    CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::AsTheyCome);
+    const CImageARGB source = ViewOf(context, geometry, instance.input);
+    const auto width = static_cast<float>(canvas.GetImage().GetWidth());
+    const auto height = static_cast<float>(canvas.GetImage().GetHeight());
+    particles.SetFrame(
+        {
+            .density = instance.params[2],
+            .minSize = instance.params[0],
+            .maxSize = instance.params[1],
+            .isRefractive = isRefractive,
+            .displayWidth = static_cast<int32_t>(context.displayAspectX),
+            .displayHeight = static_cast<int32_t>(context.displayAspectY),
+            .scale = width / 720.0F,
+            .spawn = {.x = 0.0F,
+                      .y = height - 1.0F,
+                      .z = instance.params[3],
+                      .xRange = width,
+                      .yRange = 0.0F},
+            .bounds = {.left = 0.0F, .top = 0.0F, .width = width, .bottom = height},
+            .canvas = &canvas.GetImage(),
+            .source = &source,
+            .body = instance.body,
+            .mask = instance.mask,
+            .cpuLevel = context.cpuLevel,
+        },
+        GetStereoMode(geometry));
+    particles.SetDuration(GetDurationMs(context));
+    particles.AdvanceTo(GetPositionMs(context, kPreview));
+
+    CopyView(geometry, instance.output, instance.input);
+    if (particles.IsVisible()) {
+        canvas.Load();
+        particles.RenderIfVisible();
+        canvas.Store();
+    }
+    return KYV_OK;
+}
+
+} // namespace
+
+void Bubble::Begin(EffectContext& context, Instance& instance) {
+    kyv::Begin(context, instance, kMiniatureMaskId);
+}
+
+KyvStatus Bubble::Process(EffectContext& context, Instance& instance) {
+    return kyv::Process(context, instance, false);
+}
+
+void Bubble::Release(EffectContext&, Instance& instance) {
+    kyv::Release(instance);
+}
+
+void RefractiveBubble::Begin(EffectContext& context, Instance& instance) {
+    kyv::Begin(context, instance, kLensMaskId);
+}
+
+KyvStatus RefractiveBubble::Process(EffectContext& context, Instance& instance) {
+    return kyv::Process(context, instance, true);
+}
+
+void RefractiveBubble::Release(EffectContext&, Instance& instance) {
+    kyv::Release(instance);
+}
+
+} // namespace kyv

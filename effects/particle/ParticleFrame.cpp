@@ -1,0 +1,134 @@
+// From the host's context to what a particle class is given.
+#include "effects/particle/ParticleFrame.h"
+
+#include <algorithm>
+#include <new>
+
+#include "effects/particle/ParticleMath.h"
+
+namespace kyv {
+namespace {
+
+using KYVImageUtility::CImageARGB;
+
+constexpr int64_t kUnitsPerMs = 10000; // host times are in 100 ns units
+
+// A canvas this many times as long as the frame's side is not meant.
+constexpr int64_t kMostStretch = 16;
+
+int32_t ToMs(int64_t time) {
+    return static_cast<int32_t>(std::clamp<int64_t>(time / kUnitsPerMs, INT32_MIN, INT32_MAX));
+}
+
+bool IsUsable(int64_t canvasSide, int32_t frameSide) {
+    return canvasSide >= 2 && canvasSide <= kMostStretch * frameSide &&
+           canvasSide * kMostStretch >= frameSide;
+}
+
+uint8_t* ViewStart(const FrameGeometry& geometry, void* frame) {
+    return static_cast<uint8_t*>(frame) + geometry.viewOffset;
+}
+
+void Scale(const CImageARGB& from, CImageARGB& to) {
+    if (!from.TryResize(to, 0)) {
+        throw std::bad_alloc();
+    }
+}
+
+} // namespace
+
+float ReadWithin(const CParamReader& params, uint32_t index, float minimum, float maximum) {
+    const float value = params.Float(index);
+    return value == value ? std::clamp(value, minimum, maximum) : 0.0F;
+}
+
+StereoMode GetStereoMode(const FrameGeometry& geometry) {
+    switch (geometry.layout) {
+    case StereoLayout_LeftHalf:
+        return StereoMode::LeftView;
+    case StereoLayout_RightHalf:
+        return StereoMode::RightView;
+    default:
+        return StereoMode::Mono;
+    }
+}
+
+int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview) {
+    if (context.preview == 0) {
+        return std::max(ToMs(context.position), 0);
+    }
+    const float fraction = context.previewFraction;
+    const float inside = fraction == fraction ? std::clamp(fraction, 0.0F, 1.0F) : 0.0F;
+    return TruncateToInt(preview.startMs) + TruncateToInt(preview.lengthMs * inside);
+}
+
+int32_t GetDurationMs(const EffectContext& context) {
+    return ToMs(context.duration);
+}
+
+CanvasSize ChooseCanvasSize(const EffectContext& context, const FrameGeometry& geometry,
+                            CanvasRule rule) {
+    const int32_t width = geometry.width;
+    const int32_t height = geometry.height;
+    const int64_t displayWidth = context.displayAspectX != 0 ? context.displayAspectX : width;
+    const int64_t displayHeight = context.displayAspectY != 0 ? context.displayAspectY : height;
+    if (geometry.layout != StereoLayout_Mono || displayWidth * height == displayHeight * width) {
+        return {width, height};
+    }
+    if (rule == CanvasRule::KeepShorterSide && width <= height) {
+        const int64_t side = displayHeight * width / displayWidth;
+        return IsUsable(side, height) ? CanvasSize{width, static_cast<int32_t>(side)}
+                                      : CanvasSize{width, height};
+    }
+    const int64_t side = displayWidth * height / displayHeight;
+    return IsUsable(side, width) ? CanvasSize{static_cast<int32_t>(side), height}
+                                 : CanvasSize{width, height};
+}
+
+CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry, void* frame) {
+    CImageARGB view(ViewStart(geometry, frame), geometry.width, geometry.height,
+                    geometry.pitchBytes);
+    view.SetCpuLevel(context.cpuLevel);
+    return view;
+}
+
+CParticleCanvas::CParticleCanvas(const EffectContext& context, const FrameGeometry& geometry,
+                                 CanvasSize size, Pixels pixels)
+    : m_bConverted(pixels == Pixels::Argb && context.pixelFormat == PixelFormat_Ayuv),
+      m_bScaled((size.width != geometry.width || size.height != geometry.height) &&
+                geometry.width >= 2 && geometry.height >= 2 && size.width >= 2 &&
+                size.height >= 2) {
+    uint8_t* start = ViewStart(geometry, context.frame);
+    if (m_bConverted) {
+        m_ayuvView.Attach(start, geometry.width, geometry.height, geometry.pitchBytes);
+        m_ayuvView.SetCpuLevel(context.cpuLevel);
+        m_frame.Create(geometry.width, geometry.height);
+    } else {
+        m_frame.Attach(start, geometry.width, geometry.height, geometry.pitchBytes);
+    }
+    m_frame.SetCpuLevel(context.cpuLevel);
+    if (m_bScaled) {
+        m_canvas.Create(size.width, size.height);
+        m_canvas.SetCpuLevel(context.cpuLevel);
+    }
+}
+
+void CParticleCanvas::Load() {
+    if (m_bConverted) {
+        m_ayuvView.ToARGB(m_frame);
+    }
+    if (m_bScaled) {
+        Scale(m_frame, m_canvas);
+    }
+}
+
+void CParticleCanvas::Store() {
+    if (m_bScaled) {
+        Scale(m_canvas, m_frame);
+    }
+    if (m_bConverted) {
+        m_frame.ToAYUV(m_ayuvView);
+    }
+}
+
+} // namespace kyv

@@ -1,0 +1,84 @@
+// What the callbacks of the particle effects share: parameters, times, and the canvas that the
+// particles are drawn on.
+#pragma once
+
+#include <cstdint>
+
+#include "effects/particle/StereoLibrary.h"
+#include "imageutility/ImageUtility.h"
+#include "module/FrameGeometry.h"
+#include "module/HostInterface.h"
+#include "module/ParamReader.h"
+
+namespace kyv {
+
+// A parameter as simulations may have it: within the limits, and 0 for what is not a number.
+float ReadWithin(const CParamReader& params, uint32_t index, float minimum, float maximum);
+
+StereoMode GetStereoMode(const FrameGeometry& geometry);
+
+// The moments that a preview's fraction of 0 to 1 runs over.
+struct PreviewSpan {
+    float startMs;
+    float lengthMs;
+};
+
+int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview);
+int32_t GetDurationMs(const EffectContext& context);
+
+struct CanvasSize {
+    int32_t width;
+    int32_t height;
+};
+
+// Which side of the frame stays when the canvas takes the display's aspect.
+enum class CanvasRule {
+    KeepShorterSide, // the width of a frame that is not wider than tall, otherwise the height
+    KeepHeight,
+};
+
+// A single view is drawn on a canvas with the display's square pixels. Stereo views, and displays
+// of an unknown or absurd aspect, give the frame's own size.
+CanvasSize ChooseCanvasSize(const EffectContext& context, const FrameGeometry& geometry,
+                            CanvasRule rule);
+
+// Where the particles are drawn: the call's view of the output frame itself, or an image of another
+// size or pixel format that is made from it and put back into it.
+class CParticleCanvas {
+public:
+    enum class Pixels {
+        AsTheyCome, // the frame's own format
+        Argb,       // AYUV frames are converted
+    };
+
+    // Throws std::bad_alloc. A size that cannot be scaled from or to the frame is not taken.
+    CParticleCanvas(const EffectContext& context, const FrameGeometry& geometry, CanvasSize size,
+                    Pixels pixels);
+
+    CParticleCanvas(const CParticleCanvas&) = delete;
+    CParticleCanvas& operator=(const CParticleCanvas&) = delete;
+
+    KYVImageUtility::CImageARGB& GetImage() { return m_bScaled ? m_canvas : m_frame; }
+
+    // The output frame's picture at its own size, in the canvas's format: the canvas itself unless
+    // that is scaled.
+    const KYVImageUtility::CImageARGB& GetFrame() const { return m_frame; }
+    bool IsConverted() const { return m_bConverted; }
+
+    // Fills the canvas from the frame, and puts it back. Throw std::bad_alloc.
+    void Load();
+    void Store();
+
+private:
+    bool m_bConverted;
+    bool m_bScaled;
+    KYVImageUtility::CImageAYUV m_ayuvView;
+    KYVImageUtility::CImageARGB m_frame; // the view itself, or its conversion
+    KYVImageUtility::CImageARGB m_canvas;
+};
+
+// The call's view of a frame of the host's, as it comes.
+KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,
+                                   void* frame);
+
+} // namespace kyv
