@@ -5,6 +5,7 @@
 #include "effects/color/ColorTemperature.h"
 #include "effects/color/WhiteBalance.h"
 #include "effects/particle/Bubble.h"
+#include "effects/particle/Fireworks.h"
 #include "effects/particle/ParticleEffects.h"
 #include "effects/pip/Freeform.h"
 #include "effects/style/StyleEffects.h"

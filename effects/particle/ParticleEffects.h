@@ -6,6 +6,5 @@
 namespace kyv {
 
 struct WaterRipple : PassThrough<40, 1, kRequestNone> {};
-struct Fireworks : PassThrough<40, 1, kRequestB> {};
 
 } // namespace kyv

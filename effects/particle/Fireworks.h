@@ -1,0 +1,29 @@
+// The fireworks effect.
+//
+//   "P1"  float  how far the sparks of a shell fly, 0..1
+//   "P2"  float  how often a shell bursts, 0..1: every 2300 ms to every 300 ms
+//   "P3"  float  depth in stereo frames, -1..1
+#pragma once
+
+#include "module/HostInterface.h"
+
+namespace kyv {
+
+class CParticleFxFireworks;
+
+struct Fireworks {
+    struct Instance {
+        void* input;
+        void* output;
+        CParticleFxFireworks* particles; // owned
+        float params[3];                 // what the animation was last simulated with
+    };
+    static_assert(sizeof(Instance) == 40);
+
+    static constexpr uint32_t kInputCount = 1;
+    static void Begin(EffectContext& context, Instance& instance);
+    static KyvStatus Process(EffectContext& context, Instance& instance);
+    static void Release(EffectContext& context, Instance& instance);
+};
+
+} // namespace kyv

@@ -1,0 +1,14 @@
+// The spot of light that stands for a spark.
+#pragma once
+
+#include <cstdint>
+
+#include "imageutility/ImageUtility.h"
+
+namespace kyv {
+
+// Makes a white square image whose alpha is a hot core in a soft glow that ends before the edge.
+// Throws std::bad_alloc.
+void DrawGlow(KYVImageUtility::CImageARGB& image, int32_t size);
+
+} // namespace kyv
