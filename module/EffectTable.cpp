@@ -6,7 +6,7 @@
 #include "effects/color/WhiteBalance.h"
 #include "effects/particle/Bubble.h"
 #include "effects/particle/Fireworks.h"
-#include "effects/particle/ParticleEffects.h"
+#include "effects/particle/WaterRipple.h"
 #include "effects/pip/Freeform.h"
 #include "effects/style/StyleEffects.h"
 #include "effects/transition/TransitionEffects.h"

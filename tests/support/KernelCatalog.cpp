@@ -92,6 +92,7 @@ std::vector<KernelEntry> MakeCatalog() {
                                          size_t count) { form(dst, src[0], count, curves); };
              }));
     AddImageOperations(list);
+    AddParticles(list);
     return list;
 }
 

@@ -1,0 +1,80 @@
+// The callbacks of the water ripple.
+#include "effects/particle/WaterRipple.h"
+
+#include <memory>
+
+#include "effects/particle/ParticleFrame.h"
+#include "effects/particle/ParticleFxWaterripple.h"
+#include "imageutility/Bitmap.h"
+
+namespace kyv {
+namespace {
+
+using KYVImageUtility::CImageARGB;
+
+constexpr uint16_t kSheenId = 145;
+
+constexpr PreviewSpan kPreview = {12000.0F, 8000.0F};
+
+} // namespace
+
+void WaterRipple::Begin(EffectContext& context, Instance& instance) {
+    Release(context, instance); // a host may prepare twice
+    instance.density = 0.0F;
+    auto particles = std::make_unique<CParticleFxWaterripple>();
+    auto sheen = std::make_unique<CImageARGB>();
+    if (context.descriptor && context.descriptor->module) {
+        LoadPngResource(*sheen, context.descriptor->module->ModuleHandle, "PNG", kSheenId);
+    }
+    instance.particles = particles.release();
+    instance.sheen = sheen.release();
+}
+
+KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
+    instance.output = context.frame;
+    if (!instance.particles || !instance.sheen || !instance.sheen->GetBuffer()) {
+        return KYV_OK; // the picture is missing: the frame stays as the host supplied it
+    }
+    FrameGeometry geometry;
+    if (!instance.input || !instance.output || !GetFrameGeometry(context, geometry)) {
+        return KYV_FAIL;
+    }
+    CParticleFxWaterripple& particles = *instance.particles;
+    const float density = ReadWithin(CParamReader(context), 0, 0.0F, 1.0F);
+    if (density != instance.density) {
+        particles.ClearSnapshots();
+        instance.density = density;
+    }
+    const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
+    CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::Argb);
+    const CImageARGB input = ViewOf(context, geometry, instance.input);
+    instance.sheen->SetCpuLevel(context.cpuLevel);
+    particles.SetFrame({
+        .canvas = &canvas.GetImage(),
+        // The converted frame is the source as the canvas's format has it.
+        .source = canvas.IsConverted() ? &canvas.GetFrame() : &input,
+        .sheen = instance.sheen,
+        .scale = static_cast<float>(canvas.GetImage().GetWidth()) / 720.0F,
+        .density = density,
+        .cpuLevel = context.cpuLevel,
+    });
+    particles.SetDuration(GetDurationMs(context));
+    particles.AdvanceTo(GetPositionMs(context, kPreview));
+
+    CopyView(geometry, instance.output, instance.input);
+    if (particles.IsVisible()) {
+        canvas.Load();
+        particles.RenderIfVisible();
+        canvas.Store();
+    }
+    return KYV_OK;
+}
+
+void WaterRipple::Release(EffectContext&, Instance& instance) {
+    delete instance.sheen;
+    instance.sheen = nullptr;
+    delete instance.particles;
+    instance.particles = nullptr;
+}
+
+} // namespace kyv
