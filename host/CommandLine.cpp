@@ -36,7 +36,7 @@ Exit status:
 
 constexpr const char* kRenderFooter =
     R"(Examples:
-  kyvhost render color-temperature photo.jpg warm.png --set P1=0.5
+  kyvhost render color-temperature photo.jpg warm.png --set P1=-0.5
   kyvhost render bubble clip.mp4 bubbles.mp4 --set density=0.8
   kyvhost render alpha-transition a.mp4 both.mp4 --input2 b.mp4 --animate P1=0:1:in-out
 
