@@ -1,0 +1,218 @@
+// The rasterizer's primitives, pixel by pixel.
+#include "effects/pip/Rasterizer.h"
+
+#include "effects/pip/SpanWalk.h"
+
+namespace kyv {
+namespace {
+
+RasterPixelCallback g_callback = nullptr;
+
+// The callback is read afresh for every pixel: it may replace itself.
+void Emit(RasterPixel& pixel, int64_t x, int64_t y) {
+    if (g_callback) {
+        pixel.x = static_cast<int32_t>(x);
+        pixel.y = static_cast<int32_t>(y);
+        g_callback(&pixel);
+    }
+}
+
+// A fresh record for every pixel: the callback may not change the next one.
+void Plot(int64_t x, int64_t y) {
+    RasterPixel pixel = {};
+    Emit(pixel, x, y);
+}
+
+void EmitTriangleSpan(const RasterPoint (&vertices)[3], int32_t y, int32_t first, int32_t last) {
+    for (int64_t x = first; x <= last; ++x) {
+        RasterPixel pixel = {0, 0, {}, {vertices[0], vertices[1], vertices[2]}};
+        Emit(pixel, x, y);
+    }
+}
+
+} // namespace
+
+std::mutex CRasterLock::s_mutex;
+
+int32_t TruncateToInt(float value) {
+    if (!(value > -0x1p31F)) {
+        return value <= -0x1p31F ? INT32_MIN : 0;
+    }
+    return value < 0x1p31F ? static_cast<int32_t>(value) : INT32_MAX;
+}
+
+void CRasterizer::SetPixelCallback(RasterPixelCallback callback) {
+    g_callback = callback;
+}
+
+void CRasterizer::PlotPixel(int32_t x, int32_t y) {
+    Plot(x, y);
+}
+
+void CRasterizer::DrawLine(int32_t x0, int32_t y0, int32_t x1, int32_t y1) {
+    int64_t x = x0;
+    int64_t y = y0;
+    const int64_t dx = std::abs(int64_t{x1} - x0);
+    const int64_t dy = std::abs(int64_t{y1} - y0);
+    const int64_t stepX = x1 < x0 ? -1 : 1;
+    const int64_t stepY = y1 < y0 ? -1 : 1;
+    if (dx < dy) {
+        for (int64_t error = 2 * dx - dy; y != y1; y += stepY, error += 2 * dx) {
+            Plot(x, y);
+            if (error >= 0) {
+                x += stepX;
+                error -= 2 * dy;
+            }
+        }
+    } else {
+        for (int64_t error = 2 * dy - dx; x != x1; x += stepX, error += 2 * dy) {
+            Plot(x, y);
+            if (error >= 0) {
+                y += stepY;
+                error -= 2 * dx;
+            }
+        }
+    }
+    Plot(x, y);
+}
+
+void CRasterizer::FillCircle(int32_t centreX, int32_t centreY, int32_t radius) {
+    WalkCircle({centreX, centreY}, radius,
+               [](int64_t below, int64_t above, int64_t first, int64_t last) {
+                   for (int64_t x = first; x <= last; ++x) {
+                       Plot(x, below);
+                       Plot(x, above);
+                   }
+               });
+}
+
+void CRasterizer::FillTriangle(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c) {
+    if (!a || !b || !c) {
+        return;
+    }
+    const RasterPoint vertices[3] = {*a, *b, *c};
+    WalkTriangle(vertices, [&](int32_t y, int32_t first, int32_t last) {
+        EmitTriangleSpan(vertices, y, first, last);
+    });
+}
+
+void CRasterizer::FillQuad(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c,
+                           const RasterPoint* d) {
+    if (!a || !b || !c || !d) {
+        return;
+    }
+    FillTriangle(a, b, c);
+    FillTriangle(a, c, d);
+}
+
+void CRasterizer::FillTriangleF(const RasterPointF* a, const RasterPointF* b,
+                                const RasterPointF* c) {
+    if (!a || !b || !c) {
+        return;
+    }
+    const RasterPoint vertices[3] = {Truncate(*a), Truncate(*b), Truncate(*c)};
+    FillTriangle(&vertices[0], &vertices[1], &vertices[2]);
+}
+
+void CRasterizer::FillQuadF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c,
+                            const RasterPointF* d) {
+    FillTriangleF(a, b, c);
+    FillTriangleF(a, c, d);
+}
+
+void CRasterizer::FillQuadWithin(const RasterWindow& window, const RasterPoint (&quad)[4]) {
+    const CWindowWalk walk(window);
+    for (const int third : {2, 3}) {
+        const RasterPoint vertices[3] = {quad[0], quad[third - 1], quad[third]};
+        walk.ClampTriangle(vertices, [&](int32_t y, int32_t first, int32_t last) {
+            EmitTriangleSpan(vertices, y, first, last);
+        });
+    }
+}
+
+void CRasterizer::FillTriangleInside(const RasterWindow& window, const RasterPoint (&triangle)[3]) {
+    CWindowWalk(window).ClipTriangle(triangle, [&](int32_t y, int32_t first, int32_t last) {
+        EmitTriangleSpan(triangle, y, first, last);
+    });
+}
+
+void CRasterizer::FillCircleInside(const RasterWindow& window, RasterPoint centre, int32_t radius) {
+    CWindowWalk(window).ClipCircle(centre, radius, [](int32_t y, int32_t first, int32_t last) {
+        for (int32_t x = first; x <= last; ++x) {
+            Plot(x, y);
+        }
+    });
+}
+
+void CRasterizer::PlotEightWay(int32_t centreX, int32_t centreY, int32_t u, int32_t v) {
+    const int64_t x = centreX;
+    const int64_t y = centreY;
+    for (const auto& [dx, dy] : {RasterPoint{u, v}, RasterPoint{v, u}}) {
+        Plot(x + dx, y + dy);
+        Plot(x - dx, y + dy);
+        Plot(x + dx, y - dy);
+        Plot(x - dx, y - dy);
+    }
+}
+
+void CRasterizer::DrawCircle(int32_t centreX, int32_t centreY, int32_t radius) {
+    if (radius < 0) {
+        return;
+    }
+    // The same decisions as the disc's, so that the outline is its rim.
+    int64_t u = 0;
+    int64_t v = radius;
+    int64_t decision = 3 - 2 * v;
+    for (; u <= v; ++u) {
+        PlotEightWay(centreX, centreY, static_cast<int32_t>(u), static_cast<int32_t>(v));
+        if (decision >= 0) {
+            decision += 4 * (u - v) + 10;
+            --v;
+        } else {
+            decision += 4 * u + 6;
+        }
+    }
+}
+
+void CRasterizer::DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX, int32_t radiusY) {
+    constexpr int32_t kLongest = 1 << 19; // its cubes are what 64 bits hold
+    if (radiusX < 0 || radiusY < 0 || radiusX > kLongest || radiusY > kLongest) {
+        return;
+    }
+    const int64_t a2 = int64_t{radiusX} * radiusX;
+    const int64_t b2 = int64_t{radiusY} * radiusY;
+    const auto plot = [&](int64_t u, int64_t v) {
+        Plot(centreX + u, centreY + v);
+        Plot(centreX - u, centreY + v);
+        Plot(centreX + u, centreY - v);
+        Plot(centreX - u, centreY - v);
+    };
+    // From the left end to the top: error is b2 x^2 + a2 y^2 - a2 b2 at the point one step further
+    // along both axes, which says which of the two steps comes nearer to the curve.
+    int64_t x = -int64_t{radiusX};
+    int64_t y = 0;
+    int64_t stepX = b2 * (1 + 2 * x);
+    int64_t stepY = a2;
+    int64_t error = stepX + stepY;
+    while (x <= 0) {
+        plot(x, y);
+        const int64_t twice = 2 * error;
+        if (twice >= stepX) {
+            ++x;
+            stepX += 2 * b2;
+            error += stepX;
+        }
+        if (twice <= stepY) {
+            ++y;
+            stepY += 2 * a2;
+            error += stepY;
+        }
+    }
+    // A flat ellipse reaches its middle before its top.
+    for (; y < radiusY; ++y) {
+        Plot(centreX, centreY + y + 1);
+        Plot(centreX, centreY - y - 1);
+    }
+}
+
+} // namespace kyv

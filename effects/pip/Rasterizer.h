@@ -1,0 +1,112 @@
+// Turns points, lines, circles, triangles and quads into a stream of pixel positions.
+//
+// A pixel is emitted or it is not: there is no sub-pixel precision and no coverage. Spans include
+// both of their ends and shapes their last row, so shapes that share an edge both emit it, and some
+// primitives emit a pixel twice. What a pixel means is the receiver's affair; it must put up with
+// repeats.
+//
+// Every primitive hands its pixels to the one callback of the process, which is null at first and
+// stays until it is replaced. Without one nothing is emitted. The callback is not guarded: whoever
+// draws through it holds CRasterLock meanwhile. Code that wants whole spans, and no state shared by
+// the process, takes them from effects/pip/SpanWalk.h, on which the primitives stand.
+#pragma once
+
+#include <cstdint>
+#include <mutex>
+
+namespace kyv {
+
+struct RasterPoint {
+    int32_t x;
+    int32_t y;
+};
+
+struct RasterPointF {
+    float x;
+    float y;
+};
+
+// Columns left to right and rows top to bottom, both ends inside; never empty.
+struct RasterWindow {
+    int32_t left;
+    int32_t top;
+    int32_t right;
+    int32_t bottom;
+};
+
+struct RasterPixel {
+    int32_t x;
+    int32_t y;
+    uint32_t attributes[10]; // zero
+    RasterPoint vertices[3]; // of a filled triangle, in the caller's order; otherwise zero
+};
+
+using RasterPixelCallback = void (*)(const RasterPixel* pixel);
+
+// Held by everything that sets the callback and draws through it, so that instances on different
+// threads take turns. Not recursive.
+class CRasterLock {
+public:
+    CRasterLock() : m_lock(s_mutex) {}
+
+private:
+    static std::mutex s_mutex;
+    std::lock_guard<std::mutex> m_lock;
+};
+
+class CRasterizer {
+public:
+    virtual ~CRasterizer() = default;
+
+    static void SetPixelCallback(RasterPixelCallback callback);
+
+    static void PlotPixel(int32_t x, int32_t y);
+
+    // Bresenham, both end points included. Where both distances are equal x is the major axis.
+    static void DrawLine(int32_t x0, int32_t y0, int32_t x1, int32_t y1);
+
+    // A midpoint disc; nothing for a radius below 1. Some rows are emitted more than once.
+    static void FillCircle(int32_t centreX, int32_t centreY, int32_t radius);
+
+    // Rows top to bottom, left to right in a row. Nothing if a pointer is null. Positions are
+    // interpolated in 32 bits, so they are exact while a coordinate times the triangle's height
+    // stays below 2^31; beyond, the products wrap.
+    static void FillTriangle(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c);
+
+    // The triangles ABC and ACD. Nothing if a pointer is null.
+    static void FillQuad(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c,
+                         const RasterPoint* d);
+
+    // Points are truncated toward zero. Values beyond 32 bits go to the nearest end of them, and
+    // those that are not a number to 0.
+    static void FillTriangleF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c);
+
+    // The triangles ABC and ACD, each only when all three of its points are there.
+    static void FillQuadF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c,
+                          const RasterPointF* d);
+
+    // For frames: the pixels of FillQuad with every position outside the window moved to the
+    // nearest one inside. What lies outside costs next to nothing, however far away it is, and is
+    // repeated less often.
+    static void FillQuadWithin(const RasterWindow& window, const RasterPoint (&quad)[4]);
+    // For frames: the pixels of FillTriangle and of FillCircle that are inside the window.
+    static void FillTriangleInside(const RasterWindow& window, const RasterPoint (&triangle)[3]);
+    static void FillCircleInside(const RasterWindow& window, RasterPoint centre, int32_t radius);
+
+    // The points (+-u, +-v) and (+-v, +-u) about the centre; those that coincide are repeated.
+    static void PlotEightWay(int32_t centreX, int32_t centreY, int32_t u, int32_t v);
+    // The outline of a midpoint circle in eight-way points; radius 0 is the centre, and nothing for
+    // a negative one.
+    static void DrawCircle(int32_t centreX, int32_t centreY, int32_t radius);
+    // The outline of an ellipse by its half axes; nothing when one is negative or beyond 2^19.
+    static void DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX, int32_t radiusY);
+};
+
+// Toward zero; the nearest end of the range beyond 32 bits, and 0 for what is not a number.
+int32_t TruncateToInt(float value);
+
+inline RasterPoint Truncate(const RasterPointF& point) {
+    return {TruncateToInt(point.x), TruncateToInt(point.y)};
+}
+
+} // namespace kyv
