@@ -93,6 +93,7 @@ std::vector<KernelEntry> MakeCatalog() {
              }));
     AddImageOperations(list);
     AddParticles(list);
+    AddPip(list);
     return list;
 }
 

@@ -54,5 +54,6 @@ inline constexpr auto kInPlaceOnly = [](uint32_t) {
 // The parts of the list that live in files of their own.
 void AddImageOperations(std::vector<KernelEntry>& list);
 void AddParticles(std::vector<KernelEntry>& list);
+void AddPip(std::vector<KernelEntry>& list);
 
 } // namespace kyvtest

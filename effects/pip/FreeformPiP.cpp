@@ -1,0 +1,313 @@
+// Builds the map of a quad and draws the picture through it.
+#include "effects/pip/FreeformPiP.h"
+
+#include <algorithm>
+#include <atomic>
+
+#include "effects/pip/QuadRenderers.h"
+#include "effects/pip/SpanWalk.h"
+
+namespace kyv {
+namespace {
+
+using KYVImageUtility::CImageARGB;
+
+// Written under CRasterLock, so that nobody becomes current while another object draws through the
+// callback.
+std::atomic<CFreeformPiP*> g_current = nullptr;
+
+void ToFloat(const RasterPoint (&points)[4], RasterPointF (&floats)[4]) {
+    std::transform(points, points + 4, floats, [](RasterPoint p) {
+        return RasterPointF{static_cast<float>(p.x), static_cast<float>(p.y)};
+    });
+}
+
+} // namespace
+
+CFreeformPiP::CFreeformPiP() : m_pFilter(SelectResampleFilter(4, nullptr)) {
+    const CRasterLock lock;
+    g_current = this;
+}
+
+CFreeformPiP::~CFreeformPiP() {
+    const CRasterLock lock;
+    if (g_current == this) {
+        g_current = nullptr;
+    }
+}
+
+CFreeformPiP* CFreeformPiP::Current() {
+    return g_current;
+}
+
+void CFreeformPiP::SetSize(int32_t sourceWidth, int32_t sourceHeight, int32_t destWidth,
+                           int32_t destHeight) {
+    if (sourceWidth != m_nSourceWidth || sourceHeight != m_nSourceHeight ||
+        destWidth != m_nDestWidth || destHeight != m_nDestHeight) {
+        m_bDirty = true;
+    }
+    m_nSourceWidth = sourceWidth;
+    m_nSourceHeight = sourceHeight;
+    m_nDestWidth = destWidth;
+    m_nDestHeight = destHeight;
+    m_bSizeSet = sourceWidth > 0 && sourceHeight > 0 && destWidth > 0 && destHeight > 0;
+}
+
+// True when a point has changed.
+bool CFreeformPiP::StorePoints(const RasterPoint* points, int32_t count, RasterPoint (&stored)[4]) {
+    bool changed = false;
+    for (int32_t i = 0; i < count; ++i) {
+        const RasterPoint point = {std::clamp(points[i].x, -kFarthestPoint, kFarthestPoint),
+                                   std::clamp(points[i].y, -kFarthestPoint, kFarthestPoint)};
+        changed = changed || point.x != stored[i].x || point.y != stored[i].y;
+        stored[i] = point;
+    }
+    return changed;
+}
+
+int32_t CFreeformPiP::SetSourcePoints(const RasterPoint* points, int32_t count) {
+    if (!points || count < 0 || count > kPointLimit) {
+        return 0;
+    }
+    m_bDirty = StorePoints(points, count, m_sourcePoints) || m_bDirty;
+    return 1;
+}
+
+int32_t CFreeformPiP::SetDestPoints(const RasterPoint* points, int32_t count) {
+    if (!points || count < 0 || count > kPointLimit) {
+        return 0;
+    }
+    m_bDirty = StorePoints(points, count, m_destPoints) || m_bDirty;
+    return 1;
+}
+
+void CFreeformPiP::SetQuadModel(int32_t model) {
+    m_nQuadModel = model;
+    m_bDirty = true;
+}
+
+void CFreeformPiP::SetMapMode(int32_t mode) {
+    m_nMapMode = mode;
+    m_bDirty = true;
+}
+
+void CFreeformPiP::SetFilterIndex(int32_t index) {
+    m_pFilter = SelectResampleFilter(index, m_pFilter);
+    m_bDirty = true;
+}
+
+int32_t CFreeformPiP::Render(const CImageARGB& source, CImageARGB& destination) {
+    if (!source.GetBuffer() || source.GetWidth() != m_nSourceWidth ||
+        source.GetHeight() != m_nSourceHeight) {
+        return 0;
+    }
+    return Draw({source.GetBuffer(), source.GetPitch(), m_nSourceWidth, m_nSourceHeight},
+                destination, Renderer::Picture);
+}
+
+int32_t CFreeformPiP::RenderCheckerboard(CImageARGB& destination) {
+    if (m_nMapMode != MapMode_Nearest && m_nMapMode != MapMode_Bilinear) {
+        return 0;
+    }
+    return Draw({}, destination, Renderer::Checkerboard);
+}
+
+// The images that are drawn from and on, for the length of a drawing, however it ends.
+class CFreeformPiP::CDrawing {
+public:
+    CDrawing(CFreeformPiP& pip, const SamplePicture& picture, CImageARGB& destination)
+        : m_pip(pip) {
+        m_pip.m_picture = picture;
+        m_pip.m_pDestination = &destination;
+    }
+    ~CDrawing() {
+        m_pip.m_picture = {};
+        m_pip.m_pDestination = nullptr;
+    }
+    CDrawing(const CDrawing&) = delete;
+    CDrawing& operator=(const CDrawing&) = delete;
+
+private:
+    CFreeformPiP& m_pip;
+};
+
+int32_t CFreeformPiP::Draw(const SamplePicture& picture, CImageARGB& destination,
+                           Renderer renderer) {
+    if (!m_bSizeSet || !destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
+        destination.GetHeight() != m_nDestHeight) {
+        return 0;
+    }
+    if (m_nMapMode < MapMode_Nearest || m_nMapMode > MapMode_Filtered) {
+        return 1;
+    }
+    if (m_bDirty) {
+        Allocate();
+        RasterPointF quad[4], source[4];
+        ToFloat(m_destPoints, quad);
+        ToFloat(m_sourcePoints, source);
+        m_model.Set(quad, source);
+    }
+    const InstructionSet set = Resolve(destination.GetCpuLevel());
+    const CDrawing drawing(*this, picture, destination);
+    m_renderer = renderer;
+    m_pMapRow = kQuadMapRow.For(set);
+    m_pSampleRow = kQuadSampleRow.For(set);
+
+    const RasterWindow window = {0, 0, m_nDestWidth - 1, m_nDestHeight - 1};
+    if (set == InstructionSet::Scalar) {
+        DrawThroughCallback(m_destPoints, window);
+    } else {
+        // Span by span, so that the entries are read while the cache still has them.
+        CWindowWalk(window).ClampQuad(m_destPoints, [&](int32_t y, int32_t first, int32_t last) {
+            const auto count = static_cast<size_t>(last - first) + 1;
+            if (m_bDirty) {
+                BuildSpan(first, y, count);
+            }
+            RenderSpan(first, y, count);
+        });
+    }
+    m_bDirty = false;
+    return 1;
+}
+
+size_t CFreeformPiP::EntriesPerPixel() const {
+    return m_nMapMode == MapMode_GridNearest || m_nMapMode == MapMode_GridBilinear ? kGridSamples
+                                                                                   : 1;
+}
+
+// Room for the mode's map; what it holds is rebuilt in any case.
+void CFreeformPiP::Allocate() {
+    const auto pixels = static_cast<size_t>(m_nDestWidth) * static_cast<size_t>(m_nDestHeight);
+    if (m_nMapMode == MapMode_Filtered) {
+        m_records.clear();
+        m_records.resize(pixels * 2);
+        return;
+    }
+    m_records.clear();
+    m_records.shrink_to_fit();
+    const size_t entries = pixels * EntriesPerPixel();
+    if (entries != m_mapEntries) {
+        m_pSourceMap.reset();
+        m_mapEntries = 0;
+        // Pages that no quad touches are never touched here either.
+        m_pSourceMap.reset(new uint32_t[entries]);
+        m_mapEntries = entries;
+    }
+}
+
+void CFreeformPiP::DrawThroughCallback(const RasterPoint (&quad)[4], const RasterWindow& window) {
+    const CRasterLock lock;
+    g_current = this;
+    if (m_bDirty) {
+        CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
+            if (CFreeformPiP* pip = Current()) {
+                pip->BuildPixel(*pixel);
+            }
+        });
+        CRasterizer::FillQuadWithin(window, quad);
+    }
+    CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
+        if (CFreeformPiP* pip = Current()) {
+            pip->RenderPixel(*pixel);
+        }
+    });
+    CRasterizer::FillQuadWithin(window, quad);
+}
+
+void CFreeformPiP::BuildPixel(const RasterPixel& pixel) {
+    if (m_pDestination) {
+        BuildSpan(std::clamp(pixel.x, 0, m_nDestWidth - 1),
+                  std::clamp(pixel.y, 0, m_nDestHeight - 1), 1);
+    }
+}
+
+// The callback stays installed after a drawing, and pixels that somebody else emits then find
+// nothing to draw on.
+void CFreeformPiP::RenderPixel(const RasterPixel& pixel) {
+    if (m_pDestination) {
+        RenderSpan(std::clamp(pixel.x, 0, m_nDestWidth - 1),
+                   std::clamp(pixel.y, 0, m_nDestHeight - 1), 1);
+    }
+}
+
+void CFreeformPiP::BuildSpan(int32_t x, int32_t y, size_t count) {
+    if (m_nMapMode == MapMode_Filtered) {
+        BuildFiltered(x, y, count);
+        return;
+    }
+    const auto first =
+        static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
+    uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();
+    const bool bilinear = m_nQuadModel == QuadModel_InverseBilinear;
+    if (EntriesPerPixel() == 1) {
+        if (bilinear) {
+            m_pMapRow(map, x, count, m_model.PlanRow(y));
+            return;
+        }
+        for (size_t i = 0; i < count; ++i) {
+            map[i] = m_model.WachspressEntry(x + static_cast<double>(i), y);
+        }
+        return;
+    }
+    // A regular grid about the pixel, a third of a pixel apart.
+    constexpr double kOffsets[] = {-1.0 / 3.0, 0.0, 1.0 / 3.0};
+    for (size_t i = 0; i < count; ++i) {
+        for (const double dy : kOffsets) {
+            for (const double dx : kOffsets) {
+                const double px = x + static_cast<double>(i) + dx;
+                *map++ = bilinear ? m_model.InverseBilinearEntry(px, y + dy)
+                                  : m_model.WachspressEntry(px, y + dy);
+            }
+        }
+    }
+}
+
+void CFreeformPiP::BuildFiltered(int32_t x, int32_t y, size_t count) {
+    const auto first =
+        static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
+    for (size_t i = 0; i < count; ++i) {
+        const double px = x + static_cast<double>(i);
+        const QuadPoint point = m_nQuadModel == QuadModel_InverseBilinear
+                                    ? m_model.InverseBilinearPoint(px, y)
+                                    : m_model.WachspressPoint(px, y);
+        ContributionRecord* records = m_records.data() + (first + i) * 2;
+        records[0].reset();
+        records[1].reset();
+        if (point.inside) {
+            records[0] = MakeContribution(*m_pFilter, static_cast<float>(point.u), point.scaleU,
+                                          m_nSourceWidth);
+            records[1] = MakeContribution(*m_pFilter, static_cast<float>(point.v), point.scaleV,
+                                          m_nSourceHeight);
+        }
+    }
+}
+
+void CFreeformPiP::RenderSpan(int32_t x, int32_t y, size_t count) {
+    uint8_t* dst = m_pDestination->Row(y) + ptrdiff_t{4} * x;
+    const auto first =
+        static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
+    const uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();
+    if (m_renderer == Renderer::Checkerboard) {
+        RenderChecker(dst, map, count);
+        return;
+    }
+    switch (m_nMapMode) {
+    case MapMode_Nearest:
+        RenderNearest(dst, map, count, m_picture);
+        break;
+    case MapMode_GridNearest:
+        RenderGridNearest(dst, map, count, m_picture);
+        break;
+    case MapMode_GridBilinear:
+        RenderGridBilinear(dst, map, count, m_picture);
+        break;
+    case MapMode_Filtered:
+        RenderFiltered(dst, m_records.data() + first * 2, count, m_picture);
+        break;
+    default:
+        m_pSampleRow(dst, map, count, m_picture);
+        break;
+    }
+}
+
+} // namespace kyv

@@ -1,0 +1,91 @@
+// The catalogue's entries of the picture-in-picture.
+#include <algorithm>
+#include <cstring>
+#include <random>
+
+#include "effects/pip/QuadModel.h"
+#include "effects/pip/QuadSampleRow.h"
+#include "tests/support/KernelRows.h"
+
+namespace kyvtest {
+namespace {
+
+// Convex, crossing and empty quads, rectangles, quads with one pair of parallel sides, and some of
+// absurd size.
+kyv::CQuadModel RandomQuad(uint32_t seed) {
+    std::mt19937 random(seed);
+    const int range = seed % 7 == 0 ? kyv::kFarthestPoint : seed % 7 < 3 ? 12 : 90;
+    const auto coordinate = [&] {
+        return static_cast<float>(static_cast<int>(random() % (2U * range + 1)) - range);
+    };
+    kyv::RasterPointF quad[4], picture[4];
+    for (kyv::RasterPointF& corner : quad) {
+        corner = {coordinate(), coordinate()};
+    }
+    if (seed % 3 == 0) { // a parallelogram
+        quad[3] = {quad[0].x + quad[2].x - quad[1].x, quad[0].y + quad[2].y - quad[1].y};
+    } else if (seed % 5 == 0) { // B to C is parallel to A to D
+        quad[2] = {quad[1].x + 2 * (quad[3].x - quad[0].x),
+                   quad[1].y + 2 * (quad[3].y - quad[0].y)};
+    }
+    for (kyv::RasterPointF& corner : picture) {
+        corner = {coordinate(), coordinate()};
+    }
+    kyv::CQuadModel model;
+    model.Set(quad, picture);
+    return model;
+}
+
+void AddQuads(std::vector<KernelEntry>& list) {
+    list.push_back(
+        Blocks(kyv::kQuadMapRow, {.table = "kQuadMapRow", .sourceBytes = {}}, [](uint32_t seed) {
+            return [model = RandomQuad(seed), left = static_cast<int>(seed % 80) -
+                                                     40](auto form, const KernelBuffers& buffers) {
+                std::vector<uint32_t> map(static_cast<size_t>(buffers.size.width));
+                for (int32_t y = 0; y < buffers.size.height; ++y) {
+                    form(map.data(), left, map.size(), model.PlanRow(y));
+                    std::memcpy(buffers.dst + y * buffers.dstPitch, map.data(), map.size() * 4);
+                }
+            };
+        }));
+    const auto bindSample = [](uint32_t seed) {
+        return [seed](auto form, const KernelBuffers& buffers) {
+            const KernelBuffers::Source& source = buffers.sources[0];
+            const kyv::SamplePicture picture = {source.pixels, source.pitch, source.size.width,
+                                                source.size.height};
+            std::mt19937 random(seed);
+            std::vector<uint32_t> map(static_cast<size_t>(buffers.size.width));
+            for (int32_t y = 0; y < buffers.size.height; ++y) {
+                // Mostly a smooth walk, as in a quad, with entries anywhere now and then.
+                uint32_t u = random() % (static_cast<uint32_t>(picture.width) * 64 + 1);
+                for (uint32_t& entry : map) {
+                    u += 40 + random() % 48;
+                    const uint32_t v = static_cast<uint32_t>(y) * 64 + random() % 64;
+                    entry = random() % 30 == 0
+                                ? static_cast<uint32_t>(random())
+                                : v << 16 | u % (static_cast<uint32_t>(picture.width) * 64 + 1);
+                }
+                form(buffers.dst + y * buffers.dstPitch, map.data(), map.size(), picture);
+            }
+        };
+    };
+    list.push_back(Blocks(kyv::kQuadSampleRow,
+                          {.table = "kQuadSampleRow",
+                           .readsDst = true,
+                           .sourceSize = [](Size dst, uint32_t seed) -> Size {
+                               // Down to pictures in which no pixel has neighbours, and up to full
+                               // reach.
+                               return {
+                                   1 + static_cast<int32_t>(seed % 9 ? seed % 70 : seed % 1100),
+                                   1 + (seed % 4 ? dst.height : static_cast<int32_t>(seed % 3))};
+                           }},
+                          bindSample));
+}
+
+} // namespace
+
+void AddPip(std::vector<KernelEntry>& list) {
+    AddQuads(list);
+}
+
+} // namespace kyvtest
