@@ -3,6 +3,7 @@
 #include <cstring>
 #include <random>
 
+#include "effects/pip/LayerRows.h"
 #include "effects/pip/QuadModel.h"
 #include "effects/pip/QuadSampleRow.h"
 #include "tests/support/KernelRows.h"
@@ -82,10 +83,44 @@ void AddQuads(std::vector<KernelEntry>& list) {
                           bindSample));
 }
 
+void AddLayers(std::vector<KernelEntry>& list) {
+    list.push_back(
+        Rows(kyv::kColorKeyRow, {.table = "kColorKeyRow", .readsDst = true}, [](uint32_t seed) {
+            const uint8_t tolerances[] = {0, 127, 255, static_cast<uint8_t>(seed)};
+            const uint32_t keys[] = {seed * 2654435761U >> 8, 0xFFFFFF, 0};
+            return [tolerance = tolerances[seed % 4], key = keys[seed % 3]](
+                       auto form, uint8_t* pixels, const uint8_t* const* src, size_t count) {
+                form(pixels, src[0], count, key, tolerance);
+            };
+        }));
+    list.push_back(Rows(kyv::kStampRow, {.table = "kStampRow", .readsDst = true, .inPlace = true},
+                        [](uint32_t seed) {
+                            return [pixel = seed % 2 ? seed * 2654435761U : 0](
+                                       auto form, uint8_t* dst, const uint8_t* const* src,
+                                       size_t count) { form(dst, src[0], count, pixel); };
+                        }));
+    list.push_back(
+        Rows(kyv::kGradientRow, {.table = "kGradientRow", .readsDst = true, .sourceBytes = {}},
+             [](uint32_t seed) {
+                 std::mt19937 random(seed);
+                 std::vector<float> top(4 * 2000), rise(top.size());
+                 const uint32_t range = seed % 2 ? 256 : 100000; // far outside too
+                 for (size_t i = 0; i < top.size(); ++i) {
+                     top[i] = static_cast<float>(random() % range) - static_cast<float>(range / 4);
+                     rise[i] = static_cast<float>(random() % range) - static_cast<float>(range / 2);
+                 }
+                 return [top, rise, part = static_cast<float>(random() % 1000) / 999.0F](
+                            auto form, uint8_t* pixels, const uint8_t* const*, size_t count) {
+                     form(pixels, top.data(), rise.data(), count, part);
+                 };
+             }));
+}
+
 } // namespace
 
 void AddPip(std::vector<KernelEntry>& list) {
     AddQuads(list);
+    AddLayers(list);
 }
 
 } // namespace kyvtest

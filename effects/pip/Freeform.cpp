@@ -1,0 +1,302 @@
+// The free-form picture-in-picture effect.
+#include "effects/pip/Freeform.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include "effects/pip/FreeformPiP.h"
+#include "effects/pip/PipLayers.h"
+#include "imageutility/Conversion.h"
+#include "module/FrameGeometry.h"
+#include "module/ParamReader.h"
+
+namespace kyv {
+
+// The work images, kept from frame to frame; those of a layer that is off have no pixels.
+class CPipWork {
+public:
+    CPipLayer picture;
+    CPipLayer border;
+    CPipLayer shadow;
+};
+
+namespace {
+
+using KYVImageUtility::CImageARGB;
+
+// The frame for which sizes in pixels are authored.
+constexpr float ReferenceWidth = 320.0F;
+constexpr float ReferenceHeight = 240.0F;
+
+// The bounding box takes no coordinate beyond this.
+constexpr int32_t kFarthestInBox = 99999;
+
+struct LayerSettings {
+    bool enabled;
+    uint8_t alpha;
+    int32_t blur; // pixels
+    LayerColor first, second;
+    int32_t direction;
+};
+
+struct Settings {
+    RasterPoint corners[4];
+    bool keyEnabled;
+    uint32_t key; // 0x00RRGGBB
+    uint8_t tolerance;
+    LayerSettings picture; // without colours
+    LayerSettings shadow;
+    int32_t shadowX, shadowY;
+    LayerSettings border;
+    int32_t borderSize;
+};
+
+int32_t ToPixels(float part, int32_t length) {
+    return std::clamp(TruncateToInt(part * static_cast<float>(length)), -kFarthestPoint,
+                      kFarthestPoint);
+}
+
+// A size or a radius, scaled; no frame has use for one beyond its own longest side.
+int32_t Scale(int32_t size, float scale) {
+    return std::clamp(TruncateToInt(static_cast<float>(size) * scale), 0,
+                      static_cast<int32_t>(kMaxFrameSide));
+}
+
+LayerColor ToLayerColor(uint32_t color, bool ayuv) {
+    uint32_t r = color & 255;
+    uint32_t g = color >> 8 & 255;
+    uint32_t b = color >> 16 & 255;
+    if (ayuv) {
+        // Y, U and V take the places of R, G and B.
+        KYVImageUtility::RgbToYuv(r, g, b, &r, &g, &b);
+    }
+    return {{static_cast<uint8_t>(b), static_cast<uint8_t>(g), static_cast<uint8_t>(r)}};
+}
+
+Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometry, bool ayuv) {
+    const CParamReader params(context);
+    const float scaleX = static_cast<float>(geometry.width) / ReferenceWidth;
+    const float scaleY = static_cast<float>(geometry.height) / ReferenceHeight;
+    const float scaleBlur = (scaleX + scaleY) / 2.0F;
+    Settings s = {};
+    for (uint32_t i = 0; i < 4; ++i) {
+        s.corners[i] = {ToPixels(params.Float(2 * i), geometry.width),
+                        ToPixels(params.Float(2 * i + 1), geometry.height)};
+    }
+    s.keyEnabled = params.Int(8) != 0;
+    const uint32_t key = params.Color(9);
+    s.key = (key & 255) << 16 | (key & 0xFF00) | (key >> 16 & 255);
+    s.tolerance = params.Byte(10);
+    s.picture.enabled = params.Int(12) != 0;
+    s.picture.alpha = params.Byte(13);
+    s.picture.blur = Scale(params.Int(14), scaleBlur);
+    s.shadow.enabled = params.Int(15) != 0;
+    s.shadow.first = ToLayerColor(params.Color(16), ayuv);
+    s.shadow.second = ToLayerColor(params.Color(17), ayuv);
+    s.shadow.direction = params.Int(18);
+    s.shadow.alpha = params.Byte(19);
+    s.shadow.blur = Scale(params.Int(20), scaleBlur);
+    s.shadowX = ToPixels(params.Float(21), geometry.width);
+    s.shadowY = ToPixels(params.Float(22), geometry.height);
+    s.border.enabled = params.Int(23) != 0;
+    s.borderSize = s.border.enabled ? Scale(params.Int(24), scaleX) : 0;
+    s.border.first = ToLayerColor(params.Color(25), ayuv);
+    s.border.second = ToLayerColor(params.Color(26), ayuv);
+    s.border.direction = params.Int(27);
+    s.border.alpha = params.Byte(28);
+    s.border.blur = Scale(params.Int(29), scaleBlur);
+    return s;
+}
+
+// The corners' bounding box, both ends inside.
+RasterWindow BoundCorners(const RasterPoint (&corners)[4]) {
+    const auto capped = [](int32_t value) { return std::min(value, kFarthestInBox); };
+    RasterWindow box = {kFarthestInBox, kFarthestInBox, -kFarthestPoint, -kFarthestPoint};
+    for (const RasterPoint& corner : corners) {
+        box.left = std::min(box.left, capped(corner.x));
+        box.top = std::min(box.top, capped(corner.y));
+        box.right = std::max(box.right, capped(corner.x));
+        box.bottom = std::max(box.bottom, capped(corner.y));
+    }
+    return box;
+}
+
+// One frame's work. What is drawn is the same as if every pass went over the whole frame.
+class CFrameWork {
+public:
+    CFrameWork(const Settings& settings, CFreeformPiP& pip, CPipWork& work, bool ayuv)
+        : m_settings(settings), m_pip(pip), m_work(work), m_ayuv(ayuv) {
+        const RasterWindow box = BoundCorners(settings.corners);
+        m_quadBox = {box.left, box.top, box.right + 1, box.bottom + 1};
+        m_gradientBox =
+            PixelBox{box.left, box.top, box.right, box.bottom}.Grown(settings.borderSize);
+    }
+
+    void MakeLayers(const CImageARGB& foreground) {
+        const int32_t width = foreground.GetWidth();
+        const int32_t height = foreground.GetHeight();
+        const int32_t level = foreground.GetCpuLevel();
+        m_work.picture.Reset(width, height, level);
+        RenderPicture(foreground);
+        if (m_settings.border.enabled) {
+            m_work.border.Reset(width, height, level);
+            MakeBorder();
+        }
+        if (m_settings.shadow.enabled) {
+            m_work.shadow.Reset(width, height, level);
+            MakeShadow();
+        }
+        // These are cut from unblurred coverage, so all blurring comes after.
+        if (m_settings.border.enabled) {
+            m_work.border.Blur(m_quadBox.Grown(m_settings.borderSize).CutTo(Frame()),
+                               m_settings.border.blur);
+        }
+        if (m_settings.picture.enabled) {
+            m_work.picture.Blur(m_quadBox.CutTo(Frame()), m_settings.picture.blur);
+        }
+    }
+
+    void Blend(CImageARGB& output, int32_t firstRow, int32_t rowStep) const {
+        if (m_settings.shadow.enabled) {
+            m_work.shadow.BlendOver(output, m_settings.shadow.alpha, firstRow, rowStep);
+        }
+        if (m_settings.border.enabled) {
+            m_work.border.BlendOver(output, m_settings.border.alpha, firstRow, rowStep);
+        }
+        if (m_settings.picture.enabled) {
+            m_work.picture.BlendOver(output, m_settings.picture.alpha, firstRow, rowStep);
+        }
+    }
+
+private:
+    PixelBox Frame() const { return m_work.picture.Frame(); }
+
+    void RenderPicture(const CImageARGB& foreground) {
+        CPipLayer& layer = m_work.picture;
+        if (m_quadBox.CutTo(Frame()).IsEmpty()) {
+            return;
+        }
+        // The key looks at a right and a lower neighbour. Through RGB and back, clear pixels of an
+        // AYUV layer take on a colour, which a blur then draws in from as far as it reaches.
+        const int32_t margin = m_ayuv && m_settings.keyEnabled && m_settings.picture.enabled
+                                   ? 2 * std::min(m_settings.picture.blur, Frame().Width())
+                                   : 0;
+        layer.Use(m_quadBox.Grown(std::max(margin, 1)));
+        const int32_t width = foreground.GetWidth();
+        const int32_t height = foreground.GetHeight();
+        const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
+        m_pip.SetSize(width, height, width, height);
+        m_pip.SetSourcePoints(source, 4);
+        m_pip.SetDestPoints(m_settings.corners, 4);
+        m_pip.Render(foreground, layer.Image());
+        if (m_settings.keyEnabled) {
+            layer.ColorKey(m_settings.key, m_settings.tolerance, m_ayuv);
+        }
+    }
+
+    void MakeBorder() {
+        const LayerSettings& settings = m_settings.border;
+        CPipLayer& layer = m_work.border;
+        layer.Use(m_quadBox.Grown(m_settings.borderSize));
+        DrawBorder(layer, m_settings.corners, m_settings.borderSize, settings.first.Opaque());
+        layer.Stamp(m_work.picture, 0, 0, 0);
+        Recolor(layer, settings, m_gradientBox);
+    }
+
+    void MakeShadow() {
+        const LayerSettings& settings = m_settings.shadow;
+        CPipLayer& layer = m_work.shadow;
+        const int32_t dx = m_settings.shadowX;
+        const int32_t dy = m_settings.shadowY;
+        // Only what is in the frame casts a shadow.
+        const PixelBox box =
+            m_quadBox.Grown(m_settings.borderSize).CutTo(Frame()).Moved(dx, dy).CutTo(Frame());
+        layer.Use(box);
+        if (m_settings.picture.enabled) {
+            layer.Stamp(m_work.picture, dx, dy, settings.first.Opaque());
+        }
+        if (m_settings.border.enabled) {
+            layer.Stamp(m_work.border, dx, dy, settings.first.Opaque());
+        }
+        Recolor(layer, settings, m_gradientBox.Moved(dx, dy));
+        layer.Blur(box, settings.blur);
+    }
+
+    static void Recolor(CPipLayer& layer, const LayerSettings& settings, const PixelBox& box) {
+        if (settings.first != settings.second) {
+            layer.Gradient(box, settings.direction, settings.first, settings.second);
+        }
+    }
+
+    const Settings& m_settings;
+    CFreeformPiP& m_pip;
+    CPipWork& m_work;
+    bool m_ayuv;
+    PixelBox m_quadBox;     // of the corners
+    PixelBox m_gradientBox; // widened by the border; its right and bottom are inside
+};
+
+CImageARGB ViewOf(void* frame, const FrameGeometry& geometry, int32_t cpuLevel) {
+    CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
+                    geometry.height, geometry.pitchBytes);
+    view.SetCpuLevel(cpuLevel);
+    return view;
+}
+
+// Copies the rows that the call treats.
+void CopyRows(CImageARGB& output, const CImageARGB& input, int32_t firstRow, int32_t rowStep) {
+    for (int32_t y = firstRow; y < output.GetHeight() && output.GetBuffer() != input.GetBuffer();
+         y += rowStep) {
+        std::memcpy(output.Row(y), input.Row(y), static_cast<size_t>(output.GetWidth()) * 4);
+    }
+}
+
+void Prepare(Freeform::Instance& instance) {
+    if (!instance.pip) {
+        instance.pip = new CFreeformPiP;
+    }
+    if (!instance.work) {
+        instance.work = new CPipWork;
+    }
+}
+
+} // namespace
+
+void Freeform::Begin(EffectContext&, Instance& instance) {
+    Prepare(instance);
+}
+
+KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
+    FrameGeometry geometry;
+    if (!instance.background || !context.frame || !GetFrameGeometry(context, geometry)) {
+        return KYV_FAIL;
+    }
+    const bool second = context.fieldSelector == FieldSelector_Second;
+    const bool field = second || context.fieldSelector == FieldSelector_First;
+    const int32_t firstRow = second ? 1 : 0;
+    const int32_t rowStep = field ? 2 : 1;
+    CImageARGB output = ViewOf(context.frame, geometry, context.cpuLevel);
+    const CImageARGB background = ViewOf(instance.background, geometry, context.cpuLevel);
+    if (!instance.foreground) {
+        CopyRows(output, background, firstRow, rowStep);
+        return KYV_OK;
+    }
+    Prepare(instance);
+    const bool ayuv = context.pixelFormat == PixelFormat_Ayuv;
+    const Settings settings = ReadSettings(context, geometry, ayuv);
+    CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
+    // Before the background is copied: the output may be the frame of either input.
+    work.MakeLayers(ViewOf(instance.foreground, geometry, context.cpuLevel));
+    CopyRows(output, background, firstRow, rowStep);
+    work.Blend(output, firstRow, rowStep);
+    return KYV_OK;
+}
+
+void Freeform::Release(EffectContext&, Instance& instance) {
+    delete instance.pip;
+    instance.pip = nullptr;
+    delete instance.work;
+    instance.work = nullptr;
+}
+
+} // namespace kyv

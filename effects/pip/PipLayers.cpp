@@ -1,0 +1,296 @@
+// Passes over the layers.
+#include "effects/pip/PipLayers.h"
+
+#include <cmath>
+#include <cstring>
+
+#include "effects/pip/LayerRows.h"
+#include "effects/pip/SpanWalk.h"
+#include "imageutility/kernels/ToARGB.h"
+#include "imageutility/kernels/ToAYUV.h"
+#include "platform/CpuFeatures.h"
+
+namespace kyv {
+namespace {
+
+using KYVImageUtility::CImageARGB;
+
+uint8_t* At(const CImageARGB& image, int32_t x, int32_t y) {
+    return image.Row(y) + ptrdiff_t{4} * x;
+}
+
+template <class Function>
+Function FormFor(const KernelTable<Function>& table, const CImageARGB& image) {
+    return table.For(Resolve(image.GetCpuLevel()));
+}
+
+} // namespace
+
+void CPipLayer::Reset(int32_t width, int32_t height, int32_t cpuLevel) {
+    if (m_image.GetWidth() != width || m_image.GetHeight() != height || !m_image.GetBuffer()) {
+        m_used = {};
+        m_image.Create(width, height);
+        m_image.FillBytes(0);
+    }
+    m_image.SetCpuLevel(cpuLevel);
+    for (int32_t y = m_used.top; y < m_used.bottom && !m_used.IsEmpty(); ++y) {
+        std::memset(At(m_image, m_used.left, y), 0, static_cast<size_t>(m_used.Width()) * 4);
+    }
+    m_used = {};
+}
+
+void CPipLayer::Stamp(const CPipLayer& layer, int32_t dx, int32_t dy, uint32_t pixel) {
+    const PixelBox box = layer.m_used.Moved(dx, dy).CutTo(m_used);
+    if (box.IsEmpty()) {
+        return;
+    }
+    const StampRow stamp = FormFor(kStampRow, m_image);
+    for (int32_t y = box.top; y < box.bottom; ++y) {
+        stamp(At(m_image, box.left, y), At(layer.m_image, box.left - dx, y - dy),
+              static_cast<size_t>(box.Width()), pixel);
+    }
+}
+
+void CPipLayer::Gradient(const PixelBox& rectangle, int32_t direction, const LayerColor& first,
+                         const LayerColor& second) {
+    if (m_used.IsEmpty() || rectangle.IsEmpty()) {
+        return;
+    }
+    // Per corner, top left, top right, bottom left, bottom right: the first colour, the second, or
+    // what lies between them.
+    enum Corner { kFirst, kSecond, kMiddle };
+    constexpr Corner kCorners[8][4] = {
+        {kSecond, kSecond, kFirst, kFirst},  {kFirst, kFirst, kSecond, kSecond},
+        {kSecond, kFirst, kSecond, kFirst},  {kFirst, kSecond, kFirst, kSecond},
+        {kSecond, kMiddle, kMiddle, kFirst}, {kMiddle, kSecond, kFirst, kMiddle},
+        {kMiddle, kFirst, kSecond, kMiddle}, {kFirst, kMiddle, kMiddle, kSecond},
+    };
+    const auto& corners = kCorners[direction >= 0 && direction < 8 ? direction : 0];
+    const auto value = [&](Corner corner, int c) {
+        const int a = first.channel[c];
+        const int b = second.channel[c];
+        return static_cast<float>(corner == kFirst ? a : corner == kSecond ? b : (a + b) >> 1);
+    };
+
+    const auto count = static_cast<size_t>(m_used.Width());
+    m_columns.assign(count * 8, 0.0F);
+    float* top = m_columns.data();
+    float* rise = top + count * 4;
+    for (size_t i = 0; i < count; ++i) {
+        const float part =
+            static_cast<float>(m_used.left + static_cast<int32_t>(i) - rectangle.left) /
+            static_cast<float>(rectangle.Width());
+        for (int c = 0; c < 3; ++c) {
+            const float upperLeft = value(corners[0], c);
+            const float upper = std::trunc(upperLeft + (value(corners[1], c) - upperLeft) * part);
+            const float lowerLeft = value(corners[2], c);
+            const float lower = std::trunc(lowerLeft + (value(corners[3], c) - lowerLeft) * part);
+            top[i * 4 + static_cast<size_t>(c)] = upper;
+            rise[i * 4 + static_cast<size_t>(c)] = lower - upper;
+        }
+    }
+    const GradientRow recolor = FormFor(kGradientRow, m_image);
+    for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
+        const float part =
+            static_cast<float>(y - rectangle.top) / static_cast<float>(rectangle.Height());
+        recolor(At(m_image, m_used.left, y), top, rise, count, part);
+    }
+}
+
+void CPipLayer::ColorKey(uint32_t key, uint8_t tolerance, bool ayuv) {
+    if (m_used.IsEmpty()) {
+        return;
+    }
+    const auto count = static_cast<size_t>(m_used.Width());
+    const ColorKeyRow keyRow = FormFor(kColorKeyRow, m_image);
+    const ToARGBRow toArgb = FormFor(kToARGB, m_image);
+    const ToAYUVRow toAyuv = FormFor(kToAYUV, m_image);
+    // A row is keyed when the one below is in RGB too.
+    if (ayuv) {
+        uint8_t* row = At(m_image, m_used.left, m_used.top);
+        toArgb(row, row, count);
+    }
+    for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
+        uint8_t* row = At(m_image, m_used.left, y);
+        uint8_t* below = y + 1 < m_used.bottom ? row + m_image.GetPitch() : row;
+        if (ayuv && below != row) {
+            toArgb(below, below, count);
+        }
+        keyRow(row, below, count, key, tolerance);
+        if (ayuv) {
+            toAyuv(row, row, count);
+        }
+    }
+}
+
+void CPipLayer::Blur(const PixelBox& content, int32_t radius) {
+    // The frame's own limit, before a part of it has another.
+    const int32_t shorter = std::min(m_image.GetWidth(), m_image.GetHeight());
+    if (radius >= 0 && shorter <= int64_t{2} * radius) {
+        radius = (shorter - 1) / 2;
+    }
+    if (radius <= 0 || m_used.IsEmpty() || content.IsEmpty()) {
+        return;
+    }
+    // The outer margin keeps the windows of what the blur reaches as large as in the frame.
+    const PixelBox part = content.Grown(2 * radius).CutTo(Frame());
+    CImageARGB view;
+    m_image.GetSubImage(view, part.left, part.top, part.Width(), part.Height());
+    view.SetCpuLevel(m_image.GetCpuLevel());
+    view.BoxBlur(view, radius);
+    const PixelBox reach = content.Grown(radius).CutTo(Frame());
+    m_used = {std::min(m_used.left, reach.left), std::min(m_used.top, reach.top),
+              std::max(m_used.right, reach.right), std::max(m_used.bottom, reach.bottom)};
+}
+
+void CPipLayer::BlendOver(CImageARGB& output, uint8_t opacity, int32_t firstRow,
+                          int32_t rowStep) const {
+    int32_t top = firstRow;
+    if (m_used.top > firstRow) {
+        top += (m_used.top - firstRow + rowStep - 1) / rowStep * rowStep;
+    }
+    if (m_used.IsEmpty() || top >= m_used.bottom) {
+        return;
+    }
+    const int32_t rows = (m_used.bottom - top + rowStep - 1) / rowStep;
+    const auto rowsOf = [&](const CImageARGB& image) {
+        CImageARGB view(At(image, m_used.left, top), m_used.Width(), rows,
+                        image.GetPitch() * rowStep);
+        view.SetCpuLevel(m_image.GetCpuLevel());
+        return view;
+    };
+    CImageARGB target = rowsOf(output);
+    target.SetCpuLevel(m_image.GetCpuLevel());
+    target.AlphaBlend(rowsOf(m_image), opacity);
+}
+
+// ------------------------------------------------------------------------------------- the border
+
+namespace {
+
+// What the pixel callback draws on; under CRasterLock.
+struct BorderTarget {
+    CImageARGB* layer;
+    RasterWindow window;
+    uint32_t pixel;
+} g_border;
+
+void DrawBorderPixel(const RasterPixel* pixel) {
+    const RasterWindow& window = g_border.window;
+    if (g_border.layer && pixel->x >= window.left && pixel->x <= window.right &&
+        pixel->y >= window.top && pixel->y <= window.bottom) {
+        std::memcpy(At(*g_border.layer, pixel->x, pixel->y), &g_border.pixel, 4);
+    }
+}
+
+// Draws through the callback.
+class CCallbackCanvas {
+public:
+    CCallbackCanvas(CImageARGB& layer, const RasterWindow& window, uint32_t pixel) {
+        g_border = {&layer, window, pixel};
+        CRasterizer::SetPixelCallback(DrawBorderPixel);
+    }
+    ~CCallbackCanvas() { g_border.layer = nullptr; }
+    CCallbackCanvas(const CCallbackCanvas&) = delete;
+    CCallbackCanvas& operator=(const CCallbackCanvas&) = delete;
+
+    void Triangle(const RasterPoint (&points)[3]) {
+        CRasterizer::FillTriangleInside(g_border.window, points);
+    }
+    void Disc(RasterPoint centre, int32_t radius) {
+        CRasterizer::FillCircleInside(g_border.window, centre, radius);
+    }
+
+private:
+    CRasterLock m_lock;
+};
+
+// Draws whole spans.
+class CSpanCanvas {
+public:
+    CSpanCanvas(CImageARGB& layer, const RasterWindow& window, uint32_t pixel)
+        : m_layer(layer), m_walk(window), m_pixel(pixel) {}
+
+    // Receives spans.
+    auto Filler() {
+        return [this](int32_t y, int32_t first, int32_t last) {
+            auto* to = reinterpret_cast<uint32_t*>(At(m_layer, first, y));
+            std::fill(to, to + (last - first + 1), m_pixel);
+        };
+    }
+
+    void Triangle(const RasterPoint (&points)[3]) { m_walk.ClipTriangle(points, Filler()); }
+    void Disc(RasterPoint centre, int32_t radius) { m_walk.ClipCircle(centre, radius, Filler()); }
+
+private:
+    CImageARGB& m_layer;
+    CWindowWalk m_walk;
+    uint32_t m_pixel;
+};
+
+// A side's unit normal; no direction for a side without length.
+RasterPointF UnitNormal(RasterPoint from, RasterPoint to) {
+    const auto dx = static_cast<float>(to.x - from.x);
+    const auto dy = static_cast<float>(to.y - from.y);
+    const float square = dx * dx + dy * dy;
+    if (square == 0.0F) {
+        return {0.0F, 0.0F};
+    }
+    // One step of Newton's after the exact root: approximate ones differ among processors.
+    float r = 1.0F / std::sqrt(square);
+    r = r * (square * r * r - 3.0F) * -0.5F;
+    return {dy * r, -dx * r};
+}
+
+RasterPoint Offset(RasterPoint point, RasterPointF normal, float by) {
+    return Truncate(
+        {static_cast<float>(point.x) + normal.x * by, static_cast<float>(point.y) + normal.y * by});
+}
+
+template <class Canvas>
+void DrawBorderShapes(Canvas& canvas, const RasterPoint (&quad)[4], int32_t size) {
+    const auto half = static_cast<float>(size / 2);
+    RasterPointF normals[4];
+    for (int i = 0; i < 4; ++i) {
+        normals[i] = UnitNormal(quad[i], quad[(i + 1) % 4]);
+    }
+    for (int i = 0; i < 4; ++i) {
+        const RasterPoint from = quad[i];
+        const RasterPoint to = quad[(i + 1) % 4];
+        const RasterPoint band[4] = {Offset(from, normals[i], half), Offset(to, normals[i], half),
+                                     Offset(to, normals[i], -half),
+                                     Offset(from, normals[i], -half)};
+        canvas.Triangle({band[0], band[1], band[2]});
+        canvas.Triangle({band[0], band[2], band[3]});
+    }
+    for (int i = 0; i < 4; ++i) {
+        // The bands' ends part on the outer side of the turn: to the left of a turn to the right.
+        const RasterPointF& before = normals[(i + 3) % 4];
+        const RasterPointF& after = normals[i];
+        const float turn = before.x * after.y - before.y * after.x;
+        const float side = turn < 0.0F ? -half : half;
+        canvas.Triangle({quad[i], Offset(quad[i], before, side), Offset(quad[i], after, side)});
+    }
+    for (const RasterPoint& corner : quad) {
+        canvas.Disc(corner, size / 2 - 1);
+    }
+}
+
+} // namespace
+
+void DrawBorder(CPipLayer& layer, const RasterPoint (&quad)[4], int32_t size, uint32_t pixel) {
+    const PixelBox& used = layer.Used();
+    if (used.IsEmpty()) {
+        return;
+    }
+    const RasterWindow window = {used.left, used.top, used.right - 1, used.bottom - 1};
+    if (Resolve(layer.Image().GetCpuLevel()) == InstructionSet::Scalar) {
+        CCallbackCanvas canvas(layer.Image(), window, pixel);
+        DrawBorderShapes(canvas, quad, size);
+    } else {
+        CSpanCanvas canvas(layer.Image(), window, pixel);
+        DrawBorderShapes(canvas, quad, size);
+    }
+}
+
+} // namespace kyv
