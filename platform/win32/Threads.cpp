@@ -1,0 +1,141 @@
+// Threads, events and locks on Windows.
+#include "platform/Threads.h"
+
+#include <new>
+
+#include <windows.h>
+
+// The start of this module's image in memory, from the linker.
+extern "C" IMAGE_DOS_HEADER __ImageBase;
+
+namespace kyv {
+
+static_assert(kInfinite == INFINITE);
+
+CEvent::CEvent() : m_pHandle(CreateEventW(nullptr, FALSE, FALSE, nullptr)) {
+    if (!m_pHandle) {
+        throw std::bad_alloc();
+    }
+}
+
+CEvent::~CEvent() {
+    CloseHandle(m_pHandle);
+}
+
+void CEvent::Set() {
+    SetEvent(m_pHandle);
+}
+
+bool CEvent::Wait(uint32_t timeoutMs) {
+    return WaitForSingleObject(m_pHandle, timeoutMs) == WAIT_OBJECT_0;
+}
+
+struct CLock::State {
+    CRITICAL_SECTION section;
+};
+
+CLock::CLock() : m_pState(new State) {
+    InitializeCriticalSection(&m_pState->section);
+}
+
+CLock::~CLock() {
+    DeleteCriticalSection(&m_pState->section);
+    delete m_pState;
+}
+
+void CLock::Lock() {
+    EnterCriticalSection(&m_pState->section);
+}
+
+bool CLock::TryLock() {
+    return TryEnterCriticalSection(&m_pState->section) != FALSE;
+}
+
+void CLock::Unlock() {
+    LeaveCriticalSection(&m_pState->section);
+}
+
+struct CThread::State {
+    HANDLE handle;
+    Entry entry;
+    void* argument;
+
+    static DWORD WINAPI Main(LPVOID state) {
+        const auto* self = static_cast<const State*>(state);
+        return self->entry(self->argument);
+    }
+
+    static bool IsOwnCode(DWORD64 address) {
+        const auto base = reinterpret_cast<DWORD64>(&__ImageBase);
+        const auto* headers = reinterpret_cast<const IMAGE_NT_HEADERS*>(
+            base + static_cast<DWORD64>(__ImageBase.e_lfanew));
+        return address - base < headers->OptionalHeader.SizeOfImage;
+    }
+};
+
+CThread::~CThread() {
+    if (m_pState) {
+        WaitForSingleObject(m_pState->handle, INFINITE);
+        CloseHandle(m_pState->handle);
+        delete m_pState;
+    }
+}
+
+bool CThread::Start(Entry entry, void* argument) {
+    auto* state = new State{nullptr, entry, argument};
+    state->handle = CreateThread(nullptr, 0, State::Main, state, CREATE_SUSPENDED, nullptr);
+    if (!state->handle) {
+        delete state;
+        return false;
+    }
+    m_pState = state;
+    ResumeThread(state->handle);
+    return true;
+}
+
+void CThread::SetPriority(int32_t priority) {
+    m_nPriority = priority;
+    SetThreadPriority(m_pState->handle, priority);
+}
+
+bool CThread::Wait(uint32_t timeoutMs) {
+    return WaitForSingleObject(m_pState->handle, timeoutMs) == WAIT_OBJECT_0;
+}
+
+void CThread::Terminate() {
+    const HANDLE handle = m_pState->handle;
+    DWORD64 lastPlace = 0;
+    DWORD64 lastStack = 0;
+    int still = 0;
+    for (int look = 0; look < kMaxLooks && still < kStillLooks; ++look) {
+        if (Wait(look == 0 ? 0 : 1)) {
+            return;
+        }
+        SuspendThread(handle);
+        CONTEXT context = {};
+        context.ContextFlags = CONTEXT_CONTROL;
+        if (GetThreadContext(handle, &context)) { // waits until the thread has stopped
+            if (State::IsOwnCode(context.Rip)) {
+                TerminateThread(handle, 0);
+            }
+            still = context.Rip == lastPlace && context.Rsp == lastStack ? still + 1 : 0;
+            lastPlace = context.Rip;
+            lastStack = context.Rsp;
+        }
+        ResumeThread(handle);
+    }
+    TerminateThread(handle, 0);
+    WaitForSingleObject(handle, INFINITE);
+}
+
+uint32_t ProcessorCount() {
+    SYSTEM_INFO info;
+    GetSystemInfo(&info);
+    return info.dwNumberOfProcessors > 0 ? info.dwNumberOfProcessors : 1;
+}
+
+void SleepMs(uint32_t milliseconds) {
+    Sleep(milliseconds);
+}
+
+} // namespace kyv
