@@ -7,8 +7,8 @@
 namespace kyv {
 namespace {
 
-constexpr float kCoreRadius = 0.28F; // of the glow's
-constexpr float kHalo = 0.5F;        // the strength of the glow round the core
+constexpr float kCoreRadius = 0.26F; // of the glow's
+constexpr float kHalo = 0.55F;       // the strength of the glow round the core
 
 // distance 0 in the centre, 1 where the glow ends.
 float Brightness(float distance) {
@@ -16,7 +16,7 @@ float Brightness(float distance) {
     const float toCore = distance / kCoreRadius;
     const float core = 1.0F / (1.0F + toCore * toCore * toCore * toCore);
     // Both end at 0 without an edge.
-    return std::min(1.0F, rest * rest * (core * 1.4F + kHalo * rest));
+    return std::min(1.0F, rest * rest * (core * 1.7F + kHalo * rest));
 }
 
 } // namespace

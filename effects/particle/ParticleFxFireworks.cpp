@@ -21,9 +21,11 @@ constexpr float kTrailSpacing = 3.5F; // pixels at scale 1
 constexpr int kMostTrailSparks = 64;
 
 // No spark of a burst lives longer than 2.4 seconds, and none that it leaves behind outlives this.
-constexpr float kShortestTrailLife = 0.25F; // seconds
-constexpr float kTrailLifeRange = 0.45F;
-constexpr int32_t kLongestLifeMs = 2400 + 700 + 100;
+constexpr float kShortestTrailLife = 0.4F; // seconds
+constexpr float kTrailLifeRange = 1.0F;
+constexpr int32_t kLongestLifeMs = 2400 + 1400 + 100;
+
+constexpr float kTrailSpread = 16.0F; // pixels per second at scale 1
 
 struct Vector {
     float x;
@@ -51,6 +53,10 @@ Color DrawColor(CParticleRandom& random) {
 
 uint8_t Dim(uint32_t channel, uint32_t factor) {
     return static_cast<uint8_t>(factor * channel >> 8);
+}
+
+uint8_t AddHeat(uint8_t channel, uint32_t heat) {
+    return static_cast<uint8_t>(std::min(channel + heat, 255U));
 }
 
 } // namespace
@@ -122,17 +128,22 @@ void CParticleFxFireworks::LeaveTrail(Spark& spark, float fromX, float fromY) {
         left.kind = Spark::Kind::Plain;
         left.x = fromX + dx * part;
         left.y = fromY + dy * part;
-        const float drift = random.Unit() * 0.15F + 0.05F;
-        left.vx = spark.vx * drift;
-        left.vy = spark.vy * drift;
+        // Slower than the spark and a little to any side: a tail that opens and sinks.
+        const float drift = random.Unit() * 0.2F + 0.05F;
+        left.vx = spark.vx * drift + (random.Unit() - 0.5F) * kTrailSpread * m_fScale;
+        left.vy = spark.vy * drift + (random.Unit() - 0.5F) * kTrailSpread * m_fScale;
         left.drag = spark.drag;
         left.startLife = random.Unit() * kTrailLifeRange + kShortestTrailLife;
         left.life = left.startLife;
-        left.size = (random.Unit() * 0.3F + 0.3F) * spark.size;
-        const uint32_t brightness = random.Next() % 160 + 90;
-        left.red = Dim(spark.red, brightness);
-        left.green = Dim(spark.green, brightness);
-        left.blue = Dim(spark.blue, brightness);
+        const float width = random.Unit();
+        left.size = (width * width * 0.6F + 0.3F) * spark.size;
+        // Most are faint and a few flash; white in all of them makes the head of a tail glow hot.
+        const float glint = random.Unit();
+        const auto brightness = static_cast<uint32_t>(glint * glint * 130.0F) + 110;
+        const auto heat = static_cast<uint32_t>(glint * 100.0F);
+        left.red = AddHeat(Dim(spark.red, brightness), heat);
+        left.green = AddHeat(Dim(spark.green, brightness), heat);
+        left.blue = AddHeat(Dim(spark.blue, brightness), heat);
         left.alpha = 255;
         left.glitter = random.GetState();
         m_newborn.push_back(left);
