@@ -27,8 +27,8 @@
 // pixels in rows of 2 * width.
 //
 // All records are little-endian with 8-byte pointers and natural alignment; every offset is
-// asserted at the end of this file. Display texts are keys: the host looks them up in the string
-// table of ModuleDescriptor::ResourceLibrary.
+// asserted at the end of this file. Display texts are keys: the host looks them up in
+// ModuleDescriptor::ResourceLibrary (LanguageLibrary.h).
 #pragma once
 
 #include <stddef.h>

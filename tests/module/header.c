@@ -1,5 +1,6 @@
-/* The public header serves C, alone and twice. */
+/* The public headers serve C, alone and together. */
 #include "module/HostInterface.h"
+#include "module/LanguageLibrary.h"
 
 KyvStatus UseHeader(EffectContext* context);
 
