@@ -2,23 +2,24 @@
 #include "imageutility/kernels/BoxBlur.h"
 
 namespace kyv {
+namespace {
 
-void BoxColumns_scalar(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count) {
+template <class Sum>
+void SlideColumns(Sum* sums, const uint8_t* enter, const uint8_t* leave, size_t count) {
     for (size_t i = 0; i < 4 * count; ++i) {
-        // Unsigned, so that the order of adding and taking off does not matter.
-        sums[i] += (enter ? enter[i] : 0U) - (leave ? leave[i] : 0U);
+        sums[i] = static_cast<Sum>(sums[i] + enter[i] - leave[i]);
     }
 }
 
-void BoxAverage_scalar(uint8_t* dst, const uint32_t* sums, size_t count,
-                       const BoxWindows& windows) {
+template <class Sum>
+void Average(uint8_t* dst, const Sum* sums, size_t count, const BoxWindows& windows) {
     const auto reach = static_cast<ptrdiff_t>(windows.radius) * 4;
     uint32_t total[4] = {};
     for (ptrdiff_t i = -reach; i < reach; ++i) {
         total[i & 3] += sums[i];
     }
     for (size_t i = 0; i < count; ++i, sums += 4, dst += 4) {
-        const auto area = static_cast<uint32_t>(windows.areas[i]);
+        const auto area = static_cast<uint32_t>(windows.columns[i] * windows.rows);
         for (int c = 0; c < 4; ++c) {
             total[c] += sums[c + reach];
             dst[c] = static_cast<uint8_t>(total[c] / area);
@@ -27,14 +28,50 @@ void BoxAverage_scalar(uint8_t* dst, const uint32_t* sums, size_t count,
     }
 }
 
-constinit const KernelTable<BoxColumnsRow> kBoxColumns = {
-    .scalar = BoxColumns_scalar,
-    .avx2 = KYV_VECTOR_FORM(BoxColumns_avx2),
+} // namespace
+
+void BoxColumns16_scalar(uint16_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count) {
+    SlideColumns(sums, enter, leave, count);
+}
+
+void BoxColumns32_scalar(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count) {
+    SlideColumns(sums, enter, leave, count);
+}
+
+void BoxBlur16_scalar(uint8_t* dst, uint16_t* sums, const uint8_t* enter, const uint8_t* leave,
+                      size_t count, const BoxWindows& windows) {
+    SlideColumns(sums, enter, leave, count);
+    Average(dst, sums, count, windows);
+}
+
+void BoxBlur32_scalar(uint8_t* dst, uint32_t* sums, const uint8_t* enter, const uint8_t* leave,
+                      size_t count, const BoxWindows& windows) {
+    SlideColumns(sums, enter, leave, count);
+    Average(dst, sums, count, windows);
+}
+
+constinit const KernelTable<BoxColumnsRow16> kBoxColumns16 = {
+    .scalar = BoxColumns16_scalar,
+    .sse2 = KYV_VECTOR_FORM(BoxColumns16_sse2),
+    .avx2 = KYV_VECTOR_FORM(BoxColumns16_avx2),
 };
 
-constinit const KernelTable<BoxAverageRow> kBoxAverage = {
-    .scalar = BoxAverage_scalar,
-    .avx2 = KYV_VECTOR_FORM(BoxAverage_avx2),
+constinit const KernelTable<BoxColumnsRow32> kBoxColumns32 = {
+    .scalar = BoxColumns32_scalar,
+    .sse2 = KYV_VECTOR_FORM(BoxColumns32_sse2),
+    .avx2 = KYV_VECTOR_FORM(BoxColumns32_avx2),
+};
+
+constinit const KernelTable<BoxBlurRow16> kBoxBlur16 = {
+    .scalar = BoxBlur16_scalar,
+    .sse2 = KYV_VECTOR_FORM(BoxBlur16_sse2),
+    .avx2 = KYV_VECTOR_FORM(BoxBlur16_avx2),
+};
+
+constinit const KernelTable<BoxBlurRow32> kBoxBlur32 = {
+    .scalar = BoxBlur32_scalar,
+    .sse2 = KYV_VECTOR_FORM(BoxBlur32_sse2),
+    .avx2 = KYV_VECTOR_FORM(BoxBlur32_avx2),
 };
 
 } // namespace kyv

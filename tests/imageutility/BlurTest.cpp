@@ -1,4 +1,6 @@
 // Box blur against the rule written out pixel by pixel.
+#include <limits>
+
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
@@ -105,32 +107,66 @@ TEST(BoxBlur, HugeWindowsDoNotOverflow) {
     }
 }
 
-// Every quotient at both sides of its limits, for areas of every size.
-TEST(BoxBlur, DividesExactly) {
-    constexpr int32_t kAreaMax = (2 * kyv::kBoxRadiusMax + 1) * (2 * kyv::kBoxRadiusMax + 1);
-    std::vector<int32_t> areas = {1, 2, 3, 4095, 4096, 4097, 16128, 16129, 16130, 65535, kAreaMax};
-    std::mt19937 random(1);
-    for (int i = 0; i < 3000; ++i) {
-        areas.push_back(static_cast<int32_t>(random() >> (8 + random() % 23)) % kAreaMax + 1);
+// Every quotient at both sides of its limits: one pixel between zeros, whose four sums are chosen.
+template <class Sum, class Function>
+void ExpectExactDivision(const kyv::KernelTable<Function>& table, kyv::InstructionSet set,
+                         int32_t columns, int32_t rows) {
+    const Function form = table.Exact(set);
+    if (!form || set > kyv::ProcessorInstructionSet()) {
+        return;
     }
+    const auto area = static_cast<uint32_t>(columns * rows);
+    const float reciprocal = 1.0F / static_cast<float>(columns);
+    for (uint32_t q = 0; q < 254; ++q) {
+        const uint32_t limit = area * (q + 1);
+        const uint32_t totals[4] = {limit - 1, limit, limit + area - 1, limit + area / 2};
+        if (totals[2] > std::numeric_limits<Sum>::max()) {
+            return; // such a sum takes more than one column
+        }
+        Sum sums[5 * 4] = {};
+        std::copy_n(totals, 4, sums + 8);
+        uint8_t out[4];
+        const uint8_t row[4] = {};
+        form(out, sums + 8, row, row, 1, {1, rows, &columns, &reciprocal});
+        ASSERT_THAT(out, testing::ElementsAre(q, q + 1, q + 1, q + 1))
+            << columns << " x " << rows << ", set " << static_cast<int>(set);
+    }
+}
+
+TEST(BoxBlur, DividesExactly) {
+    std::mt19937 random(1);
     for (const auto set : {kyv::InstructionSet::Scalar, kyv::InstructionSet::Sse2,
                            kyv::InstructionSet::Ssse3, kyv::InstructionSet::Avx2}) {
-        const kyv::BoxAverageRow form = kyv::kBoxAverage.Exact(set);
-        if (!form || set > kyv::ProcessorInstructionSet()) {
-            continue;
+        for (int32_t i = 1; i <= 127; ++i) {
+            ExpectExactDivision<uint16_t>(kyv::kBoxBlur16, set, i, 128 - i);
+            ExpectExactDivision<uint32_t>(kyv::kBoxBlur32, set, 127, i);
         }
-        for (const int32_t area : areas) {
-            // One pixel between the zeros around it, whose four sums are two limits.
-            for (uint32_t q = 0; q < 255; q += 1 + random() % 3) {
-                uint32_t sums[5 * 4] = {};
-                const auto limit = static_cast<uint32_t>(area) * (q + 1);
-                const uint32_t totals[4] = {limit - 1, limit, limit + area - 1, limit + area / 2U};
-                std::copy_n(totals, 4, sums + 8);
-                const float scale = kyv::AverageScale(area);
-                uint8_t out[4];
-                form(out, sums + 8, 1, {1, &area, &scale});
-                ASSERT_THAT(out, testing::ElementsAre(q, q + 1, q + 1, q + 1))
-                    << "area " << area << ", set " << static_cast<int>(set);
+        for (int i = 0; i < 1000; ++i) {
+            constexpr int32_t kSideMax = 2 * kyv::kBoxRadiusMax + 1;
+            const auto columns = static_cast<int32_t>(random() % kSideMax) + 1;
+            ExpectExactDivision<uint32_t>(kyv::kBoxBlur32, set, columns,
+                                          i % 8 ? static_cast<int32_t>(random() % kSideMax) + 1
+                                                : kSideMax);
+        }
+    }
+}
+
+// The same where whole windows fit, which may divide by another way: sums that all equal a limit.
+TEST(BoxBlur, DividesExactlyWhereWholeWindowsFit) {
+    CImageARGB image(140, 140), out(140, 140);
+    ASSERT_TRUE(image.GetBuffer() && out.GetBuffer());
+    for (const int32_t radius : {1, 7, 62, 63, 64, 69}) {
+        const int32_t side = 2 * radius + 1;
+        for (int32_t value = 0; value < 255; value += 6) {
+            // Flat but for one pixel in the middle of the windows, which lacks 1.
+            image.FillBytes(static_cast<uint8_t>(value + 1));
+            image.Row(70)[70 * 4] = static_cast<uint8_t>(value);
+            for (const int32_t level : {0, 3, 4}) {
+                image.SetCpuLevel(level);
+                image.BoxBlur(out, radius);
+                const uint8_t* middle = out.Row(70) + 70 * 4;
+                ASSERT_EQ(middle[0], value) << "side " << side << ", level " << level;
+                ASSERT_EQ(middle[1], value + 1) << "side " << side << ", level " << level;
             }
         }
     }

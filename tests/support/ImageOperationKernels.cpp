@@ -94,51 +94,65 @@ void AddResizing(std::vector<KernelEntry>& list) {
 
 // --- Box blur
 
-// Sums as those of rows equal rows would be, with averages that divide unevenly.
-void AverageRows(kyv::BoxAverageRow form, const KernelBuffers& buffers, int32_t radius,
-                 int32_t rows) {
+// Sums as if all rows of the windows were equal to the one that leaves.
+template <class Sum, class Function>
+void BlurRows(Function form, const KernelBuffers& buffers, int32_t radius, int32_t rows) {
     const int32_t width = buffers.size.width;
     const size_t border = static_cast<size_t>(radius) + 1;
-    std::vector<uint32_t> sums((static_cast<size_t>(width) + 2 * border) * 4);
-    std::vector<int32_t> areas(static_cast<size_t>(width));
-    std::vector<float> scales(areas.size());
+    std::vector<Sum> sums((static_cast<size_t>(width) + 2 * border) * 4);
+    std::vector<int32_t> columns(static_cast<size_t>(width));
+    std::vector<float> reciprocals(columns.size());
     for (int32_t x = 0; x < width; ++x) {
-        const int32_t inside = std::min(x + radius, width - 1) - std::max(x - radius, 0) + 1;
-        areas[static_cast<size_t>(x)] = inside * rows;
-        scales[static_cast<size_t>(x)] = kyv::AverageScale(inside * rows);
+        const auto i = static_cast<size_t>(x);
+        columns[i] = std::min(x + radius, width - 1) - std::max(x - radius, 0) + 1;
+        reciprocals[i] = 1.0F / static_cast<float>(columns[i]);
     }
-    const kyv::BoxWindows windows = {radius, areas.data(), scales.data()};
     for (int32_t y = 0; y < buffers.size.height; ++y) {
-        const uint8_t* src = buffers.sources[0].pixels + y * buffers.sources[0].pitch;
-        for (size_t i = 0; i < areas.size() * 4; ++i) {
-            sums[border * 4 + i] = src[i] * static_cast<uint32_t>(rows);
+        const uint8_t* enter = buffers.sources[0].pixels + y * buffers.sources[0].pitch;
+        const uint8_t* leave = buffers.sources[1].pixels + y * buffers.sources[1].pitch;
+        for (size_t i = 0; i < columns.size() * 4; ++i) {
+            sums[border * 4 + i] = static_cast<Sum>(leave[i] * rows);
         }
-        form(buffers.dst + y * buffers.dstPitch, sums.data() + border * 4, areas.size(), windows);
+        form(buffers.dst + y * buffers.dstPitch, sums.data() + border * 4, enter, leave,
+             columns.size(), kyv::BoxWindows{radius, rows, columns.data(), reciprocals.data()});
     }
 }
 
-void AddBlur(std::vector<KernelEntry>& list) {
-    list.push_back(
-        Rows(kyv::kBoxColumns,
-             {.table = "kBoxColumns", .dstBytes = 16, .readsDst = true, .sourceBytes = {4, 4}},
-             [](uint32_t seed) {
-                 return [seed](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
-                     // Rows of sums are aligned; the test's buffers need not be.
-                     std::vector<uint32_t> sums(count * 4 + 1);
-                     std::memcpy(sums.data(), dst, count * 16);
-                     form(sums.data(), seed % 3 == 1 ? nullptr : src[0],
-                          seed % 3 == 2 ? nullptr : src[1], count);
-                     std::memcpy(dst, sums.data(), count * 16);
-                 };
-             }));
-    list.push_back(Blocks(kyv::kBoxAverage, {.table = "kBoxAverage"}, [](uint32_t seed) {
-        const int32_t radii[] = {1, 2, 5, 31, 127, 400, kyv::kBoxRadiusMax};
-        const int32_t radius = radii[seed % std::size(radii)];
+template <class Sum, class Function>
+KernelEntry BlurEntry(const kyv::KernelTable<Function>& table, const char* name,
+                      std::vector<int32_t> radii) {
+    return Blocks(table, {.table = name, .sourceBytes = {4, 4}}, [radii](uint32_t seed) {
+        const int32_t radius = radii[seed % radii.size()];
         const auto rows = static_cast<int32_t>(seed * 7919 % (2U * radius + 1)) + 1;
-        return [radius, rows](kyv::BoxAverageRow form, const KernelBuffers& buffers) {
-            AverageRows(form, buffers, radius, rows);
+        return [radius, rows](Function form, const KernelBuffers& buffers) {
+            BlurRows<Sum>(form, buffers, radius, rows);
         };
-    }));
+    });
+}
+
+template <class Sum, class Function>
+KernelEntry ColumnsEntry(const kyv::KernelTable<Function>& table, const char* name) {
+    constexpr int kBytes = 4 * sizeof(Sum);
+    return Rows(table, {.table = name, .dstBytes = kBytes, .readsDst = true, .sourceBytes = {4, 4}},
+                [](uint32_t) {
+                    return
+                        [](Function form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+                            // Sums are aligned in memory; the buffers need not be.
+                            std::vector<Sum> sums(count * 4 + 1);
+                            std::memcpy(sums.data(), dst, count * kBytes);
+                            form(sums.data(), src[0], src[1], count);
+                            std::memcpy(dst, sums.data(), count * kBytes);
+                        };
+                });
+}
+
+void AddBlur(std::vector<KernelEntry>& list) {
+    list.push_back(ColumnsEntry<uint16_t>(kyv::kBoxColumns16, "kBoxColumns16"));
+    list.push_back(ColumnsEntry<uint32_t>(kyv::kBoxColumns32, "kBoxColumns32"));
+    list.push_back(
+        BlurEntry<uint16_t>(kyv::kBoxBlur16, "kBoxBlur16", {1, 2, 5, 31, kyv::kBoxRadiusMax16}));
+    list.push_back(BlurEntry<uint32_t>(kyv::kBoxBlur32, "kBoxBlur32",
+                                       {1, 2, 5, 31, 127, 400, kyv::kBoxRadiusMax}));
 }
 
 } // namespace
