@@ -133,17 +133,14 @@ public:
     }
 
     void MakeLayers(const CImageARGB& foreground) {
-        const int32_t width = foreground.GetWidth();
-        const int32_t height = foreground.GetHeight();
-        const int32_t level = foreground.GetCpuLevel();
-        m_work.picture.Reset(width, height, level);
+        m_work.picture.Reset(foreground, m_ayuv);
         RenderPicture(foreground);
         if (m_settings.border.enabled) {
-            m_work.border.Reset(width, height, level);
+            m_work.border.Reset(foreground, m_ayuv);
             MakeBorder();
         }
         if (m_settings.shadow.enabled) {
-            m_work.shadow.Reset(width, height, level);
+            m_work.shadow.Reset(foreground, m_ayuv);
             MakeShadow();
         }
         // These are cut from unblurred coverage, so all blurring comes after.
@@ -176,12 +173,8 @@ private:
         if (m_quadBox.CutTo(Frame()).IsEmpty()) {
             return;
         }
-        // The key looks at a right and a lower neighbour. Through RGB and back, clear pixels of an
-        // AYUV layer take on a colour, which a blur then draws in from as far as it reaches.
-        const int32_t margin = m_ayuv && m_settings.keyEnabled && m_settings.picture.enabled
-                                   ? 2 * std::min(m_settings.picture.blur, Frame().Width())
-                                   : 0;
-        layer.Use(m_quadBox.Grown(std::max(margin, 1)));
+        // With the neighbours that the key looks at.
+        layer.Use(m_quadBox.Grown(1));
         const int32_t width = foreground.GetWidth();
         const int32_t height = foreground.GetHeight();
         const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
@@ -190,7 +183,7 @@ private:
         m_pip.SetDestPoints(m_settings.corners, 4);
         m_pip.Render(foreground, layer.Image());
         if (m_settings.keyEnabled) {
-            layer.ColorKey(m_settings.key, m_settings.tolerance, m_ayuv);
+            layer.ColorKey(m_settings.key, m_settings.tolerance);
         }
     }
 
@@ -199,7 +192,7 @@ private:
         CPipLayer& layer = m_work.border;
         layer.Use(m_quadBox.Grown(m_settings.borderSize));
         DrawBorder(layer, m_settings.corners, m_settings.borderSize, settings.first.Opaque());
-        layer.Stamp(m_work.picture, 0, 0, 0);
+        layer.ClearUnder(m_work.picture);
         Recolor(layer, settings, m_gradientBox);
     }
 

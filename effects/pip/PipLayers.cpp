@@ -26,15 +26,19 @@ Function FormFor(const KernelTable<Function>& table, const CImageARGB& image) {
 
 } // namespace
 
-void CPipLayer::Reset(int32_t width, int32_t height, int32_t cpuLevel) {
-    if (m_image.GetWidth() != width || m_image.GetHeight() != height || !m_image.GetBuffer()) {
+void CPipLayer::Reset(const CImageARGB& frame, bool ayuv) {
+    if (!m_image.GetBuffer() || !m_image.IsSameSize(frame)) {
         m_used = {};
-        m_image.Create(width, height);
-        m_image.FillBytes(0);
+        m_image.Create(frame.GetWidth(), frame.GetHeight());
+        m_used = Frame();
+    } else if (ayuv != m_bAyuv) {
+        m_used = Frame();
     }
-    m_image.SetCpuLevel(cpuLevel);
-    for (int32_t y = m_used.top; y < m_used.bottom && !m_used.IsEmpty(); ++y) {
-        std::memset(At(m_image, m_used.left, y), 0, static_cast<size_t>(m_used.Width()) * 4);
+    m_bAyuv = ayuv;
+    m_image.SetCpuLevel(frame.GetCpuLevel());
+    for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
+        auto* row = reinterpret_cast<uint32_t*>(At(m_image, m_used.left, y));
+        std::fill_n(row, std::max(m_used.Width(), 0), Clear());
     }
     m_used = {};
 }
@@ -97,7 +101,7 @@ void CPipLayer::Gradient(const PixelBox& rectangle, int32_t direction, const Lay
     }
 }
 
-void CPipLayer::ColorKey(uint32_t key, uint8_t tolerance, bool ayuv) {
+void CPipLayer::ColorKey(uint32_t key, uint8_t tolerance) {
     if (m_used.IsEmpty()) {
         return;
     }
@@ -106,18 +110,18 @@ void CPipLayer::ColorKey(uint32_t key, uint8_t tolerance, bool ayuv) {
     const ToARGBRow toArgb = FormFor(kToARGB, m_image);
     const ToAYUVRow toAyuv = FormFor(kToAYUV, m_image);
     // A row is keyed when the one below is in RGB too.
-    if (ayuv) {
+    if (m_bAyuv) {
         uint8_t* row = At(m_image, m_used.left, m_used.top);
         toArgb(row, row, count);
     }
     for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
         uint8_t* row = At(m_image, m_used.left, y);
         uint8_t* below = y + 1 < m_used.bottom ? row + m_image.GetPitch() : row;
-        if (ayuv && below != row) {
+        if (m_bAyuv && below != row) {
             toArgb(below, below, count);
         }
         keyRow(row, below, count, key, tolerance);
-        if (ayuv) {
+        if (m_bAyuv) {
             toAyuv(row, row, count);
         }
     }

@@ -2,6 +2,8 @@
 // covered, and the passes over them.
 //
 // A layer is clear outside the part in use, so every pass and every blend touches that part alone.
+// Clear is transparent black: zeros in an ARGB layer, and the black of AYUV in an AYUV one. Zeros
+// there would be a green that a blur draws into every rim.
 #pragma once
 
 #include <algorithm>
@@ -47,15 +49,18 @@ struct LayerColor {
 
 class CPipLayer {
 public:
-    // Gives the layer a size and a level and clears it. Throws std::bad_alloc.
-    void Reset(int32_t width, int32_t height, int32_t cpuLevel);
+    // Gives the layer the form of a frame and clears it. Throws std::bad_alloc.
+    void Reset(const KYVImageUtility::CImageARGB& frame, bool ayuv);
 
     KYVImageUtility::CImageARGB& Image() { return m_image; }
     PixelBox Frame() const { return {0, 0, m_image.GetWidth(), m_image.GetHeight()}; }
 
-    // The part that may hold anything but zeros; what is drawn goes into it.
+    // The part that may not be clear; what is drawn goes into it.
     const PixelBox& Used() const { return m_used; }
     void Use(const PixelBox& box) { m_used = box.CutTo(Frame()); }
+
+    // Clears the layer wherever another one is covered.
+    void ClearUnder(const CPipLayer& layer) { Stamp(layer, 0, 0, Clear()); }
 
     // Writes a pixel wherever another layer, moved by (dx, dy), is covered. Only what falls into
     // the part in use is written.
@@ -70,10 +75,10 @@ public:
 
     // Keys a colour (0x00RRGGBB) out of the part in use. An AYUV layer is converted for it and
     // back.
-    void ColorKey(uint32_t key, uint8_t tolerance, bool ayuv);
+    void ColorKey(uint32_t key, uint8_t tolerance);
 
     // The box blur of all four channels over the frame, worked out where it can be anything but
-    // zero. `content` is the part within which pixels are covered.
+    // clear. `content` is the part within which pixels are covered.
     void Blur(const PixelBox& content, int32_t radius);
 
     // Blends the part in use over an image of the frame's size. Only the rows first, first + step,
@@ -82,7 +87,10 @@ public:
                    int32_t rowStep) const;
 
 private:
+    uint32_t Clear() const { return m_bAyuv ? 0x00108080 : 0; }
+
     KYVImageUtility::CImageARGB m_image;
+    bool m_bAyuv = false;
     PixelBox m_used = {};
     std::vector<float> m_columns; // of gradients
 };
