@@ -218,6 +218,8 @@ Arguments WriterArguments(const fs::path& file, const VideoFormat& format) {
         }
         add({"-i", FileArgument(format.soundFile), "-map", "0:v:0", "-map", "1:a?"});
         add({"-map_metadata", "1"});
+        // Else the copied sound would begin where the file can be entered, before the start.
+        add({"-copypriorss:a", "0"});
         for (size_t i = 0; i < format.audioCodecs.size(); ++i) {
             const bool fits = Holds(Extension(file), format.audioCodecs[i]);
             add({"-c:a:" + std::to_string(i), fits ? "copy" : "aac"});

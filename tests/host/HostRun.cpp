@@ -13,8 +13,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-void Append(std::string& text, const char* bytes, size_t count) {
-    text.append(bytes, count);
+void DropCarriageReturns(std::string& text) {
     text.erase(std::remove(text.begin(), text.end(), '\r'), text.end());
 }
 
@@ -28,12 +27,12 @@ HostResult RunProgram(const std::string& program, const std::vector<std::string>
     std::thread errors([&] {
         char buffer[4096];
         while (const size_t count = process.ReadError(buffer, sizeof buffer)) {
-            Append(result.error, buffer, count);
+            result.error.append(buffer, count);
         }
     });
     char buffer[4096];
     while (const size_t count = process.ReadOutput(buffer, sizeof buffer)) {
-        Append(result.output, buffer, count);
+        result.output.append(buffer, count);
     }
     errors.join();
     result.status = process.Wait();
@@ -41,12 +40,19 @@ HostResult RunProgram(const std::string& program, const std::vector<std::string>
 }
 
 HostResult RunHost(const std::vector<std::string>& arguments) {
-    return RunProgram(KYV_HOST_FILE, arguments);
+    HostResult result = RunProgram(HostFile(), arguments);
+    DropCarriageReturns(result.output);
+    DropCarriageReturns(result.error);
+    return result;
 }
 
 HostResult RunHostWith(const std::string& module, std::vector<std::string> arguments) {
     arguments.insert(arguments.end(), {"--module", module});
     return RunHost(arguments);
+}
+
+std::string HostFile() {
+    return KYV_HOST_FILE;
 }
 
 std::string ProbeModule() {

@@ -13,16 +13,17 @@ namespace kyvtest {
 
 struct HostResult {
     int status = -1;
-    std::string output, error; // without carriage returns
+    std::string output, error;
 };
 
-// Runs a program with arguments; text streams are collected.
+// Runs a program with arguments and collects what it writes.
 HostResult RunProgram(const std::string& program, const std::vector<std::string>& arguments);
 
-// kyvhost with the module that the build made, or with another one.
+// kyvhost with the module that the build made, or with another one. Lines end with '\n' alone.
 HostResult RunHost(const std::vector<std::string>& arguments);
 HostResult RunHostWith(const std::string& module, std::vector<std::string> arguments);
 
+std::string HostFile();
 std::string ProbeModule();
 std::string OldModule();   // the probe with another format number
 std::string EmptyModule(); // exports nothing
