@@ -28,17 +28,17 @@ static_assert(sizeof(StereoViewInfo) == 24);
 
 struct StereoObject;
 
-// The object's operations, in slot order; the others are never called.
+// The object's operations, in slot order; the others are never called. What they return is ignored.
 struct StereoObjectTable {
     void (*reserved0)();
     // slot 1; called when a target is bound in a stereo mode, with the display's size as in view
-    void (*Configure)(StereoObject* self, const StereoViewInfo* view, int32_t displayWidth,
-                      int32_t displayHeight);
+    uint32_t (*Configure)(StereoObject* self, const StereoViewInfo* view, int32_t displayWidth,
+                          int32_t displayHeight);
     void (*reserved2)();
     void (*reserved3)();
     // slot 4; writes the horizontal shift in pixels, which moves the left view to the left and the
     // right view to the right
-    void (*GetParallax)(StereoObject* self, float depth, float* shift);
+    uint32_t (*GetParallax)(StereoObject* self, float depth, float* shift);
 };
 
 struct StereoObject {

@@ -1,0 +1,408 @@
+// The particle effects through the callbacks, as a host drives them.
+#include <algorithm>
+#include <cmath>
+#include <filesystem>
+#include <limits>
+#include <map>
+#include <random>
+#include <thread>
+
+#include <gtest/gtest.h>
+
+#include "imageutility/ImageUtility.h"
+#include "platform/Library.h"
+#include "tests/support/TestHost.h"
+
+namespace {
+
+using namespace kyvtest;
+
+constexpr const char* kEffects[] = {"Kyv_Dsp_Pfx_Bubble", "Kyv_Dsp_Pfx_RefractiveBubble",
+                                    "Kyv_Dsp_Pfx_Fireworks", "Kyv_Dsp_Pfx_WaterRipple"};
+
+constexpr int64_t kMs = 10000; // in the host's units
+
+class ParticleEffects : public testing::TestWithParam<const char*> {
+protected:
+    const EffectDescriptor& effect() const { return Effect(GetParam()); }
+    bool Is(const char* name) const { return std::string(GetParam()).ends_with(name); }
+};
+
+INSTANTIATE_TEST_SUITE_P(All, ParticleEffects, testing::ValuesIn(kEffects),
+                         [](const auto& entry) { return std::string(entry.param).substr(12); });
+
+// A smooth opaque picture that no effect leaves alone, of either format.
+Frame Gradient(int width, int height) {
+    Frame frame(static_cast<size_t>(width) * height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            const auto r = static_cast<uint32_t>(16 + x * 200 / width);
+            const auto g = static_cast<uint32_t>(16 + y * 200 / height);
+            frame[static_cast<size_t>(y) * width + x] =
+                0xFF000000 | r << 16 | g << 8 | ((x / 8 + y / 8) % 2 ? 60 : 160);
+        }
+    }
+    return frame;
+}
+
+class CClip {
+public:
+    CClip(const EffectDescriptor& effect, int width, int height)
+        : input(Gradient(width, height)), instance(effect, width, height) {
+        instance.Context().duration = 20000 * kMs;
+    }
+
+    Frame At(int64_t positionMs) {
+        instance.Context().position = positionMs * kMs;
+        Frame output(input.size(), 0x01020304);
+        EXPECT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+        return output;
+    }
+
+    Frame input;
+    CTestInstance instance;
+};
+
+TEST_P(ParticleEffects, SeekingGivesTheBytesOfPlayingInBothFormatsAtEveryLevel) {
+    constexpr int kWidth = 150;
+    constexpr int kHeight = 90;
+    for (const uint32_t format : {0U, 1U}) {
+        std::map<int64_t, Frame> expected;
+        for (const int32_t level : {0, 3, 4, 5, 1}) {
+            CClip clip(effect(), kWidth, kHeight);
+            clip.instance.Context().pixelFormat = format;
+            clip.instance.Context().cpuLevel = level;
+            ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+            std::vector<int64_t> times;
+            for (int64_t time = 0; time <= 20040; time += level == 0 ? 40 : 1000) {
+                const Frame frame = clip.At(time);
+                if (time % 1000 == 0) {
+                    times.push_back(time);
+                    if (level == 0) {
+                        expected[time] = frame;
+                    }
+                    ASSERT_EQ(frame, expected[time])
+                        << "format " << format << " level " << level << " playing at " << time;
+                }
+            }
+            std::mt19937 random(static_cast<uint32_t>(level));
+            std::shuffle(times.begin(), times.end(), random);
+            CClip other(effect(), kWidth, kHeight);
+            other.instance.Context().pixelFormat = format;
+            other.instance.Context().cpuLevel = level;
+            ASSERT_EQ(other.instance.Begin(), KYV_OK);
+            for (const int64_t time : times) {
+                ASSERT_EQ(other.At(time), expected[time])
+                    << "format " << format << " level " << level << " sought at " << time;
+            }
+        }
+        EXPECT_NE(expected[12000], Gradient(kWidth, kHeight)); // something is to be seen
+        EXPECT_NE(expected[12000], expected[13000]);
+    }
+}
+
+TEST_P(ParticleEffects, ChangedParametersSizesAndLengthsStartAnew) {
+    CClip clip(effect(), 120, 80);
+    ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+    const Frame first = clip.At(9000);
+    clip.instance.Set("P1", 0.9F);
+    const Frame changed = clip.At(9000);
+    EXPECT_NE(changed, first);
+    clip.instance.Set("P1", Is("Fireworks") || Is("Ripple") ? 0.5F : 0.2F);
+    EXPECT_EQ(clip.At(9000), first);
+    // A smaller frame for a while, within the same memory; the ripple's sheen is of the first one.
+    clip.instance.Context().width = 60;
+    clip.instance.Context().height = 40;
+    clip.At(9000);
+    clip.instance.Context().width = 120;
+    clip.instance.Context().height = 80;
+    EXPECT_EQ(clip.At(9000), first);
+    clip.instance.Context().duration = 9500 * kMs;
+    clip.At(9000);
+    clip.instance.Context().duration = 20000 * kMs;
+    EXPECT_EQ(clip.At(9000), first);
+}
+
+TEST_P(ParticleEffects, PastTheEndTheInputIsCopied) {
+    const Frame any = RandomFrame(64 * 48, 3); // AYUV that no conversion gives back
+    for (const uint32_t format : {0U, 1U}) {
+        for (const int64_t time : {20000, 20001, 999999}) {
+            CClip clip(effect(), 64, 48);
+            clip.input = any;
+            clip.instance.Context().pixelFormat = format;
+            clip.instance.Context().displayAspectX = 2; // nor a scaling
+            clip.instance.Context().displayAspectY = 3;
+            ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+            EXPECT_EQ(clip.At(time), any) << time;
+        }
+    }
+}
+
+TEST_P(ParticleEffects, WorksInPlaceAsFromFrameToFrame) {
+    for (const uint32_t format : {0U, 1U}) {
+        for (const int64_t time : {700, 9000, 19200}) {
+            CClip clip(effect(), 100, 60);
+            clip.instance.Context().pixelFormat = format;
+            ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+            const Frame apart = clip.At(time);
+            Frame inPlace = clip.input;
+            ASSERT_EQ(clip.instance.Render(inPlace.data(), inPlace.data()), KYV_OK);
+            EXPECT_EQ(inPlace, apart) << time;
+        }
+    }
+}
+
+// Frames with guards all round, and views of side-by-side frames whose other half stays.
+TEST_P(ParticleEffects, StereoViewsAreTreatedOnTheirOwn) {
+    constexpr int kWidth = 96;
+    constexpr int kHeight = 64;
+    const Frame mono = Gradient(kWidth, kHeight);
+    Frame input;
+    for (int y = 0; y < kHeight; ++y) {
+        for (int half = 0; half < 2; ++half) {
+            input.insert(input.end(), mono.begin() + y * kWidth, mono.begin() + (y + 1) * kWidth);
+        }
+    }
+    for (const uint32_t format : {0U, 1U}) {
+        CClip clip(effect(), kWidth, kHeight);
+        clip.instance.Context().pixelFormat = format;
+        ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+        const Frame expected = clip.At(9000);
+        for (const uint32_t layout : {1U, 2U}) {
+            CTestInstance instance(effect(), kWidth, kHeight);
+            instance.Context().pixelFormat = format;
+            instance.Context().stereoLayout = layout;
+            instance.Context().position = 9000 * kMs;
+            instance.Context().duration = 20000 * kMs;
+            ASSERT_EQ(instance.Begin(), KYV_OK);
+            if (!Is("Ripple")) {
+                // Depth makes no parallax without the stereo helper.
+                instance.Set(Is("Fireworks") ? "P3" : "P4", 0.7F);
+            }
+            Frame output(input.size(), 7);
+            ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+            for (int y = 0; y < kHeight; ++y) {
+                for (int x = 0; x < kWidth; ++x) {
+                    const size_t treated =
+                        static_cast<size_t>(y) * 2 * kWidth + x + (layout == 2 ? kWidth : 0);
+                    const size_t other =
+                        static_cast<size_t>(y) * 2 * kWidth + x + (layout == 2 ? 0 : kWidth);
+                    ASSERT_EQ(output[treated], expected[static_cast<size_t>(y) * kWidth + x]);
+                    ASSERT_EQ(output[other], 7U);
+                }
+            }
+        }
+    }
+}
+
+TEST_P(ParticleEffects, HostileParametersTimesAndAspectsAreBounded) {
+    const float values[] = {std::numeric_limits<float>::quiet_NaN(),
+                            std::numeric_limits<float>::infinity(),
+                            -std::numeric_limits<float>::infinity(),
+                            1e30F,
+                            -1e30F,
+                            2.0F,
+                            -0.5F,
+                            std::numeric_limits<float>::denorm_min()};
+    constexpr int64_t kTimes[] = {INT64_MIN,     -1, 0, 1, 9999, 10000, INT64_MAX, INT64_MAX / 3,
+                                  36'000'000'000};
+    std::mt19937 random(11);
+    const std::pair<int, int> sizes[] = {{1, 1}, {1, 40}, {40, 1}, {2, 2}, {3, 500}, {37, 23}};
+    for (int round = 0; round < 60; ++round) {
+        const auto& [width, height] = sizes[random() % std::size(sizes)];
+        const Frame input = RandomFrame(static_cast<size_t>(width) * height * 2, random());
+        Frame output(input.size() + 32, 9);
+        CTestInstance instance(effect(), static_cast<uint32_t>(width),
+                               static_cast<uint32_t>(height));
+        EffectContext& context = instance.Context();
+        context.pixelFormat = random() % 2;
+        context.cpuLevel = static_cast<int32_t>(random() % 6);
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        for (int frame = 0; frame < 6; ++frame) {
+            for (size_t i = 0; i * 4 < instance.Params().size(); ++i) {
+                std::memcpy(&instance.Params()[i * 4], &values[random() % std::size(values)], 4);
+            }
+            context.position = kTimes[random() % std::size(kTimes)];
+            context.duration = random() % 2 ? 0 : kTimes[random() % std::size(kTimes)];
+            context.stereoLayout = random() % 3;
+            context.preview = random() % 4 == 0;
+            context.previewFraction = values[random() % std::size(values)];
+            context.displayAspectX = random() % 2 ? 0 : random() >> random() % 32;
+            context.displayAspectY = random() % 2 ? 0 : random() >> random() % 32;
+            ASSERT_EQ(instance.Render(&output[16], input.data()), KYV_OK);
+            for (size_t i = 0; i < 16; ++i) {
+                ASSERT_EQ(output[i], 9U);
+                ASSERT_EQ(output[output.size() - 1 - i], 9U);
+            }
+        }
+    }
+}
+
+TEST_P(ParticleEffects, ADisplayOfAnotherAspectStretchesTheParticles) {
+    // On a display twice as wide as the frame's pixels say, the canvas is 160 x 60: what is drawn
+    // is that of a frame of this size, squeezed to 80.
+    CClip narrow(effect(), 80, 60);
+    narrow.instance.Context().displayAspectX = 160;
+    narrow.instance.Context().displayAspectY = 60;
+    narrow.instance.Context().cpuLevel = 5;
+    ASSERT_EQ(narrow.instance.Begin(), KYV_OK);
+    const Frame output = narrow.At(9000);
+
+    using KYVImageUtility::CImageARGB;
+    const auto wrap = [](Frame& frame, int width) {
+        return CImageARGB(reinterpret_cast<uint8_t*>(frame.data()), width, 60, width * 4);
+    };
+    CClip wide(effect(), 160, 60);
+    wide.instance.Context().cpuLevel = 5;
+    ASSERT_EQ(wide.instance.Begin(), KYV_OK);
+    CImageARGB stretched = wrap(wide.input, 160);
+    wrap(narrow.input, 80).Resize(stretched, 0);
+    Frame canvas = wide.At(9000);
+    Frame expected(80 * 60);
+    CImageARGB squeezed = wrap(expected, 80);
+    wrap(canvas, 160).Resize(squeezed, 0);
+    if (Is("_Bubble")) {
+        // The miniature shows the frame as it came, not stretched and back: compare the places.
+        size_t different = 0;
+        for (size_t i = 0; i < output.size(); ++i) {
+            different += output[i] != expected[i] ? 1 : 0;
+        }
+        EXPECT_LT(different, output.size() / 4);
+    } else {
+        EXPECT_EQ(output, expected);
+    }
+}
+
+TEST_P(ParticleEffects, APreviewShowsAMomentOfItsOwnSpan) {
+    CClip clip(effect(), 90, 70);
+    clip.instance.Context().duration = 0;
+    ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+    const int64_t moment = Is("Fireworks") ? 2000 + 3500 : Is("Ripple") ? 12000 + 4000 : 17500;
+    const Frame expected = clip.At(moment);
+    clip.instance.Context().preview = 1;
+    clip.instance.Context().previewFraction = 0.5F;
+    const Frame preview = clip.At(77);
+    if (Is("Fireworks")) {
+        // Drawn on 320 x 240 and scaled.
+        EXPECT_NE(preview, clip.input);
+        EXPECT_EQ(clip.At(123), preview);
+    } else {
+        EXPECT_EQ(preview, expected);
+    }
+}
+
+TEST_P(ParticleEffects, TwoInstancesOnTwoThreadsGiveWhatEachGivesAlone) {
+    const auto play = [this](float value) {
+        Frame all;
+        CClip clip(effect(), 70, 50);
+        clip.instance.Context().cpuLevel = 5;
+        EXPECT_EQ(clip.instance.Begin(), KYV_OK);
+        clip.instance.Set("P1", value);
+        for (const int64_t time : {0, 4000, 2000, 9000, 8000}) {
+            const Frame frame = clip.At(time);
+            all.insert(all.end(), frame.begin(), frame.end());
+        }
+        return all;
+    };
+    const Frame alone[] = {play(0.1F), play(0.9F)};
+    Frame together[2];
+    std::thread first([&] { together[0] = play(0.1F); });
+    std::thread second([&] { together[1] = play(0.9F); });
+    first.join();
+    second.join();
+    EXPECT_EQ(together[0], alone[0]);
+    EXPECT_EQ(together[1], alone[1]);
+}
+
+TEST_P(ParticleEffects, WithoutItsPicturesTheFrameStaysAsItIs) {
+    if (Is("Fireworks")) {
+        GTEST_SKIP() << "has no pictures";
+    }
+    CClip clip(effect(), 20, 20); // not prepared
+    EXPECT_EQ(clip.At(0), Frame(400, 0x01020304));
+    // A module without resources.
+    ModuleDescriptor module = *effect().module;
+    module.ModuleHandle = kyv::OpenLibrary(std::filesystem::path(KYV_STEREO_FILE).native());
+    ASSERT_NE(module.ModuleHandle, nullptr);
+    EffectDescriptor descriptor = effect();
+    descriptor.module = &module;
+    clip.instance.Context().descriptor = &descriptor;
+    ASSERT_EQ(clip.instance.Begin(), KYV_OK);
+    EXPECT_EQ(clip.At(0), Frame(400, 0x01020304));
+    clip.instance.Context().descriptor = &effect();
+    kyv::CloseLibrary(module.ModuleHandle);
+}
+
+// The helper is found by its name once it is loaded.
+class StereoDepth : public testing::Test {
+protected:
+    // The left view's frame at a depth, the right view's, and the one without any depth.
+    struct Views {
+        Frame left;
+        Frame right;
+        Frame flat;
+    };
+
+    static constexpr int kWidth = 400;
+    static constexpr int kHeight = 150;
+
+    static Views Render(const char* identifier, const char* depthKey) {
+        const auto render = [&](uint32_t layout, float depth) {
+            CTestInstance instance(Effect(identifier), kWidth, kHeight);
+            instance.Context().stereoLayout = layout;
+            instance.Context().position = 9000 * kMs;
+            EXPECT_EQ(instance.Begin(), KYV_OK);
+            instance.Set(depthKey, depth);
+            const Frame input(2 * kWidth * kHeight, 0xFF404040);
+            Frame output(input.size(), 0);
+            EXPECT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+            Frame view;
+            for (int y = 0; y < kHeight; ++y) {
+                const auto row = output.begin() + y * 2 * kWidth + (layout == 2 ? kWidth : 0);
+                view.insert(view.end(), row, row + kWidth);
+            }
+            return view;
+        };
+        return {render(1, 1.0F), render(2, 1.0F), render(1, 0.0F)};
+    }
+
+    // How many rows of the middle of a are those of b moved to the right.
+    static bool IsMoved(const Frame& a, const Frame& b, int shift) {
+        for (int y = 0; y < kHeight; ++y) {
+            for (int x = 40; x < kWidth - 40; ++x) {
+                if (a[static_cast<size_t>(y * kWidth + x)] !=
+                    b[static_cast<size_t>(y * kWidth + x - shift)]) {
+                    return false;
+                }
+            }
+        }
+        return true;
+    }
+};
+
+TEST_F(StereoDepth, WithoutTheHelperBothViewsAreTheSame) {
+    for (const auto& [effect, key] :
+         {std::pair{"Kyv_Dsp_Pfx_Bubble", "P4"}, {"Kyv_Dsp_Pfx_Fireworks", "P3"}}) {
+        const Views views = Render(effect, key);
+        EXPECT_EQ(views.left, views.right);
+        EXPECT_EQ(views.left, views.flat);
+    }
+}
+
+TEST_F(StereoDepth, WithTheHelperTheViewsMoveApart) {
+    const kyv::LibraryHandle helper =
+        kyv::OpenLibrary(std::filesystem::path(KYV_STEREO_FILE).native());
+    ASSERT_NE(helper, nullptr);
+    // Depth 1 moves each view by 1 % of its 400 pixels.
+    for (const auto& [effect, key] :
+         {std::pair{"Kyv_Dsp_Pfx_Bubble", "P4"}, {"Kyv_Dsp_Pfx_Fireworks", "P3"}}) {
+        const Views views = Render(effect, key);
+        EXPECT_TRUE(IsMoved(views.left, views.flat, -4)) << effect;
+        EXPECT_TRUE(IsMoved(views.right, views.flat, 4)) << effect;
+    }
+    const Views lenses = Render("Kyv_Dsp_Pfx_RefractiveBubble", "P4");
+    EXPECT_NE(lenses.left, lenses.right);
+    kyv::CloseLibrary(helper);
+}
+
+} // namespace
