@@ -29,13 +29,51 @@ struct EffectCase {
     const char* name;
     const char* identifier;
     std::vector<Setting> settings = {};
-    int32_t startMs = 0; // playing begins here and goes on at 30 frames a second
+    int32_t startMs = 0;                 // playing begins here and goes on at 30 frames a second
+    std::vector<Setting> alternate = {}; // every other frame has these
 };
+
+// The picture-in-picture over the whole frame or half of it, without anything else.
+std::vector<Setting> PictureOnly(float left, float top, float right, float bottom) {
+    return {{"P0", left}, {"P1", top},    {"P2", right}, {"P3", top}, {"P4", right}, {"P5", bottom},
+            {"P6", left}, {"P7", bottom}, {"P8", 0},     {"P15", 0},  {"P23", 0}};
+}
+
+// A slanted quad of about half the frame, with key, border, shadow, gradients and blurs.
+std::vector<Setting> PictureWithAll() {
+    return {{"P0", 0.1F},         {"P1", 0.2F},  {"P2", 0.85F},      {"P3", 0.1F},
+            {"P4", 0.9F},         {"P5", 0.85F}, {"P6", 0.15F},      {"P7", 0.75F},
+            {"P10", uint8_t{40}}, {"P14", 1},    {"P17", 0x800000U}, {"P20", 4},
+            {"P26", 0x00FFFFU},   {"P29", 1}};
+}
+
+std::vector<Setting> Slanted() {
+    std::vector<Setting> settings = PictureOnly(0.05F, 0.05F, 0.95F, 0.95F);
+    settings[3] = {"P3", 0.0F};
+    settings[6] = {"P6", 0.0F};
+    return settings;
+}
 
 // One line a case.
 const EffectCase kCases[] = {
     {"colour temperature", "Kyv_Dsp_Co_Temperature", {{"P1", 0.4F}, {"P3", -0.3F}}},
     {"white balance", "Kyv_Dsp_Co_WhiteBalance", {{"P1", 0xA0C0FFU}}},
+    {"pip full", "Kyv_Dsp_Pi_Freeform", PictureOnly(0.0F, 0.0F, 1.0F, 1.0F)},
+    {"pip full moving",
+     "Kyv_Dsp_Pi_Freeform",
+     PictureOnly(0.0F, 0.0F, 1.0F, 1.0F),
+     0,
+     {{"P0", 0.001F}}},
+    {"pip slanted", "Kyv_Dsp_Pi_Freeform", Slanted()},
+    {"pip slanted moving", "Kyv_Dsp_Pi_Freeform", Slanted(), 0, {{"P0", 0.06F}}},
+    {"pip half", "Kyv_Dsp_Pi_Freeform", PictureOnly(0.25F, 0.25F, 0.75F, 0.75F)},
+    {"pip half moving",
+     "Kyv_Dsp_Pi_Freeform",
+     PictureOnly(0.25F, 0.25F, 0.75F, 0.75F),
+     0,
+     {{"P0", 0.26F}}},
+    {"pip all", "Kyv_Dsp_Pi_Freeform", PictureWithAll()},
+    {"pip all moving", "Kyv_Dsp_Pi_Freeform", PictureWithAll(), 0, {{"P0", 0.11F}}},
 };
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units
@@ -69,7 +107,8 @@ const EffectDescriptor* FindEffect(const std::string& identifier) {
 class CPlayer {
 public:
     CPlayer(const EffectDescriptor& effect, const EffectCase& what, uint32_t format, int32_t level)
-        : m_effect(effect), m_data((effect.instanceDataSize + 7) / 8) {
+        : m_effect(effect), m_settings(what.settings), m_alternate(what.alternate),
+          m_data((effect.instanceDataSize + 7) / 8) {
         size_t size = 0;
         for (uint32_t i = 0; i < effect.paramCount; ++i) {
             size += effect.params[i].valueSize;
@@ -86,8 +125,10 @@ public:
         m_context.position = int64_t{what.startMs} * 10'000;
         m_context.duration = int64_t{60} * 10'000'000;
         m_ready = effect.callbacks.InitInstance(&m_context) == KYV_OK;
-        for (const Setting& setting : what.settings) {
-            m_ready = m_ready && Set(setting);
+        for (const auto* settings : {&m_settings, &m_alternate}) {
+            for (const Setting& setting : *settings) {
+                m_ready = m_ready && Set(setting);
+            }
         }
         m_ready = m_ready && effect.callbacks.BeginProcessing(&m_context) == KYV_OK && Play();
     }
@@ -104,6 +145,9 @@ public:
     bool IsReady() const { return m_ready; }
 
     bool Play() {
+        for (const Setting& setting : m_frame++ % 2 ? m_alternate : m_settings) {
+            Set(setting);
+        }
         Frames& frames = SharedFrames();
         for (uint32_t i = 0; i < m_effect.properties.inputCount; ++i) {
             m_context.frame = frames.source[i].data();
@@ -130,9 +174,12 @@ private:
     }
 
     const EffectDescriptor& m_effect;
+    const std::vector<Setting>& m_settings;
+    const std::vector<Setting>& m_alternate;
     EffectContext m_context = {};
     std::vector<uint64_t> m_data;
     std::vector<uint8_t> m_params;
+    uint32_t m_frame = 0;
     bool m_ready;
 };
 

@@ -133,7 +133,6 @@ public:
     }
 
     void MakeLayers(const CImageARGB& foreground) {
-        m_work.picture.Reset(foreground, m_ayuv);
         RenderPicture(foreground);
         if (m_settings.border.enabled) {
             m_work.border.Reset(foreground, m_ayuv);
@@ -153,15 +152,15 @@ public:
         }
     }
 
-    void Blend(CImageARGB& output, int32_t firstRow, int32_t rowStep) const {
+    void BlendRow(uint8_t* row, int32_t y) const {
         if (m_settings.shadow.enabled) {
-            m_work.shadow.BlendOver(output, m_settings.shadow.alpha, firstRow, rowStep);
+            m_work.shadow.BlendRow(row, y, m_settings.shadow.alpha);
         }
         if (m_settings.border.enabled) {
-            m_work.border.BlendOver(output, m_settings.border.alpha, firstRow, rowStep);
+            m_work.border.BlendRow(row, y, m_settings.border.alpha);
         }
         if (m_settings.picture.enabled) {
-            m_work.picture.BlendOver(output, m_settings.picture.alpha, firstRow, rowStep);
+            m_work.picture.BlendRow(row, y, m_settings.picture.alpha);
         }
     }
 
@@ -170,17 +169,21 @@ private:
 
     void RenderPicture(const CImageARGB& foreground) {
         CPipLayer& layer = m_work.picture;
-        if (m_quadBox.CutTo(Frame()).IsEmpty()) {
-            return;
-        }
-        // With the neighbours that the key looks at.
-        layer.Use(m_quadBox.Grown(1));
         const int32_t width = foreground.GetWidth();
         const int32_t height = foreground.GetHeight();
         const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
         m_pip.SetSize(width, height, width, height);
         m_pip.SetSourcePoints(source, 4);
         m_pip.SetDestPoints(m_settings.corners, 4);
+        // Through the same map the same pixels are drawn again, and the others are still clear.
+        if (m_pip.IsDirty() || !layer.Fits(foreground, m_ayuv)) {
+            layer.Reset(foreground, m_ayuv);
+        }
+        if (m_quadBox.CutTo(Frame()).IsEmpty()) {
+            return;
+        }
+        // With the neighbours that the key looks at.
+        layer.Use(m_quadBox.Grown(1));
         m_pip.Render(foreground, layer.Image());
         if (m_settings.keyEnabled) {
             layer.ColorKey(m_settings.key, m_settings.tolerance);
@@ -236,14 +239,6 @@ CImageARGB ViewOf(void* frame, const FrameGeometry& geometry, int32_t cpuLevel) 
     return view;
 }
 
-// Copies the rows that the call treats.
-void CopyRows(CImageARGB& output, const CImageARGB& input, int32_t firstRow, int32_t rowStep) {
-    for (int32_t y = firstRow; y < output.GetHeight() && output.GetBuffer() != input.GetBuffer();
-         y += rowStep) {
-        std::memcpy(output.Row(y), input.Row(y), static_cast<size_t>(output.GetWidth()) * 4);
-    }
-}
-
 void Prepare(Freeform::Instance& instance) {
     if (!instance.pip) {
         instance.pip = new CFreeformPiP;
@@ -264,24 +259,28 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     if (!instance.background || !context.frame || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const bool second = context.fieldSelector == FieldSelector_Second;
-    const bool field = second || context.fieldSelector == FieldSelector_First;
-    const int32_t firstRow = second ? 1 : 0;
-    const int32_t rowStep = field ? 2 : 1;
-    CImageARGB output = ViewOf(context.frame, geometry, context.cpuLevel);
+    const CImageARGB output = ViewOf(context.frame, geometry, context.cpuLevel);
     const CImageARGB background = ViewOf(instance.background, geometry, context.cpuLevel);
-    if (!instance.foreground) {
-        CopyRows(output, background, firstRow, rowStep);
-        return KYV_OK;
-    }
-    Prepare(instance);
     const bool ayuv = context.pixelFormat == PixelFormat_Ayuv;
     const Settings settings = ReadSettings(context, geometry, ayuv);
+    Prepare(instance);
     CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
     // Before the background is copied: the output may be the frame of either input.
-    work.MakeLayers(ViewOf(instance.foreground, geometry, context.cpuLevel));
-    CopyRows(output, background, firstRow, rowStep);
-    work.Blend(output, firstRow, rowStep);
+    if (instance.foreground) {
+        work.MakeLayers(ViewOf(instance.foreground, geometry, context.cpuLevel));
+    }
+    // Single fields leave the rows of the other one as they are.
+    const bool second = context.fieldSelector == FieldSelector_Second;
+    const int32_t step = second || context.fieldSelector == FieldSelector_First ? 2 : 1;
+    for (int32_t y = second ? 1 : 0; y < geometry.height; y += step) {
+        uint8_t* row = output.Row(y);
+        if (row != background.Row(y)) {
+            std::memcpy(row, background.Row(y), static_cast<size_t>(geometry.width) * 4);
+        }
+        if (instance.foreground) {
+            work.BlendRow(row, y);
+        }
+    }
     return KYV_OK;
 }
 

@@ -35,12 +35,19 @@ void CPipLayer::Reset(const CImageARGB& frame, bool ayuv) {
         m_used = Frame();
     }
     m_bAyuv = ayuv;
+    m_bBlurred = false;
     m_image.SetCpuLevel(frame.GetCpuLevel());
+    m_pBlendRow = FormFor(kAlphaBlend, m_image);
     for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
         auto* row = reinterpret_cast<uint32_t*>(At(m_image, m_used.left, y));
         std::fill_n(row, std::max(m_used.Width(), 0), Clear());
     }
     m_used = {};
+}
+
+bool CPipLayer::Fits(const CImageARGB& frame, bool ayuv) const {
+    return m_image.GetBuffer() && m_image.IsSameSize(frame) && ayuv == m_bAyuv && !m_bBlurred &&
+           m_image.GetCpuLevel() == frame.GetCpuLevel();
 }
 
 void CPipLayer::Stamp(const CPipLayer& layer, int32_t dx, int32_t dy, uint32_t pixel) {
@@ -142,30 +149,17 @@ void CPipLayer::Blur(const PixelBox& content, int32_t radius) {
     m_image.GetSubImage(view, part.left, part.top, part.Width(), part.Height());
     view.SetCpuLevel(m_image.GetCpuLevel());
     view.BoxBlur(view, radius);
+    m_bBlurred = true;
     const PixelBox reach = content.Grown(radius).CutTo(Frame());
     m_used = {std::min(m_used.left, reach.left), std::min(m_used.top, reach.top),
               std::max(m_used.right, reach.right), std::max(m_used.bottom, reach.bottom)};
 }
 
-void CPipLayer::BlendOver(CImageARGB& output, uint8_t opacity, int32_t firstRow,
-                          int32_t rowStep) const {
-    int32_t top = firstRow;
-    if (m_used.top > firstRow) {
-        top += (m_used.top - firstRow + rowStep - 1) / rowStep * rowStep;
+void CPipLayer::BlendRow(uint8_t* frameRow, int32_t y, uint8_t opacity) const {
+    if (!m_used.IsEmpty() && y >= m_used.top && y < m_used.bottom) {
+        m_pBlendRow(frameRow + ptrdiff_t{4} * m_used.left, At(m_image, m_used.left, y),
+                    static_cast<size_t>(m_used.Width()), opacity);
     }
-    if (m_used.IsEmpty() || top >= m_used.bottom) {
-        return;
-    }
-    const int32_t rows = (m_used.bottom - top + rowStep - 1) / rowStep;
-    const auto rowsOf = [&](const CImageARGB& image) {
-        CImageARGB view(At(image, m_used.left, top), m_used.Width(), rows,
-                        image.GetPitch() * rowStep);
-        view.SetCpuLevel(m_image.GetCpuLevel());
-        return view;
-    };
-    CImageARGB target = rowsOf(output);
-    target.SetCpuLevel(m_image.GetCpuLevel());
-    target.AlphaBlend(rowsOf(m_image), opacity);
 }
 
 // ------------------------------------------------------------------------------------- the border

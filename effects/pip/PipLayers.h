@@ -12,6 +12,7 @@
 
 #include "effects/pip/Rasterizer.h"
 #include "imageutility/ImageUtility.h"
+#include "imageutility/kernels/AlphaBlend.h"
 
 namespace kyv {
 
@@ -51,6 +52,9 @@ class CPipLayer {
 public:
     // Gives the layer the form of a frame and clears it. Throws std::bad_alloc.
     void Reset(const KYVImageUtility::CImageARGB& frame, bool ayuv);
+    // True when the layer has that form already and has not been blurred since it was cleared: what
+    // is drawn at the same places then needs no clearing before.
+    bool Fits(const KYVImageUtility::CImageARGB& frame, bool ayuv) const;
 
     KYVImageUtility::CImageARGB& Image() { return m_image; }
     PixelBox Frame() const { return {0, 0, m_image.GetWidth(), m_image.GetHeight()}; }
@@ -81,16 +85,16 @@ public:
     // clear. `content` is the part within which pixels are covered.
     void Blur(const PixelBox& content, int32_t radius);
 
-    // Blends the part in use over an image of the frame's size. Only the rows first, first + step,
-    // ... are written.
-    void BlendOver(KYVImageUtility::CImageARGB& output, uint8_t opacity, int32_t firstRow,
-                   int32_t rowStep) const;
+    // Blends a row of the part in use over the same row of a frame.
+    void BlendRow(uint8_t* frameRow, int32_t y, uint8_t opacity) const;
 
 private:
     uint32_t Clear() const { return m_bAyuv ? 0x00108080 : 0; }
 
     KYVImageUtility::CImageARGB m_image;
     bool m_bAyuv = false;
+    bool m_bBlurred = false;
+    AlphaBlendRow m_pBlendRow = nullptr;
     PixelBox m_used = {};
     std::vector<float> m_columns; // of gradients
 };

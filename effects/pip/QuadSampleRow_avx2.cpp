@@ -14,12 +14,12 @@ inline __m256i LoadEntries(const uint32_t* map) {
     return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(map));
 }
 
-// Byte offsets of a block's pixels. False when one of them has no right or lower neighbour in the
-// picture; limit is the last column and row, which have none.
-inline bool FindOffsets(uint32_t* offsets, const uint32_t* map, const SamplePicture& picture,
-                        __m256i limit, __m256i pitch) {
+// Byte offsets of a block's pixels, count of them, a multiple of 8. False when one of them has no
+// right or lower neighbour in the picture; limit is the last column and row, which have none.
+inline bool FindOffsets(uint32_t* offsets, const uint32_t* map, size_t count,
+                        const SamplePicture& picture, __m256i limit, __m256i pitch) {
     __m256i inside = _mm256_set1_epi8(-1);
-    for (size_t i = 0; i < kBlock; i += 8) {
+    for (size_t i = 0; i < count; i += 8) {
         const __m256i whole = _mm256_srli_epi16(LoadEntries(map + i), 6);
         const __m256i x = _mm256_and_si256(whole, _mm256_set1_epi32(0xFFFF));
         const __m256i y = _mm256_srli_epi32(whole, 16);
@@ -30,7 +30,7 @@ inline bool FindOffsets(uint32_t* offsets, const uint32_t* map, const SamplePict
     if (_mm256_movemask_epi8(inside) != -1) {
         return false;
     }
-    for (size_t i = 0; i < kBlock; i += 8) {
+    for (size_t i = 0; i < count; i += 8) {
         const uint8_t* upper = picture.pixels + offsets[i];
         _mm_prefetch(reinterpret_cast<const char*>(upper), _MM_HINT_T0);
         _mm_prefetch(reinterpret_cast<const char*>(upper + picture.pitch), _MM_HINT_T0);
@@ -66,11 +66,11 @@ inline __m256i FourPixels(const SamplePicture& picture, const uint32_t* offsets,
     return _mm256_add_epi16(centred, _mm256_set1_epi16(128));
 }
 
-inline void DrawBlock(uint8_t* dst, const uint32_t* map, const uint32_t* offsets,
+inline void DrawBlock(uint8_t* dst, const uint32_t* map, size_t count, const uint32_t* offsets,
                       const SamplePicture& picture) {
     const __m256i lowPixels = _mm256_setr_epi32(0, 0, 1, 1, 2, 2, 3, 3);
     const __m256i highPixels = _mm256_setr_epi32(4, 4, 5, 5, 6, 6, 7, 7);
-    for (size_t i = 0; i < kBlock; i += 8) {
+    for (size_t i = 0; i < count; i += 8) {
         // Both words of a pixel: the weights 128 - f and f as bytes, and half of v's fraction.
         const __m256i fraction = _mm256_and_si256(LoadEntries(map + i), _mm256_set1_epi16(63));
         const __m256i f = _mm256_blend_epi16(fraction, _mm256_slli_epi32(fraction, 16), 0xAA);
@@ -110,23 +110,25 @@ void QuadSampleRow_avx2(uint8_t* dst, const uint32_t* map, size_t count,
     const __m256i pitch = _mm256_set1_epi32(static_cast<int>(picture.pitch));
 
     alignas(32) uint32_t offsets[2][kBlock];
-    const size_t blocks = count / kBlock;
-    bool inside = blocks > 0 && FindOffsets(offsets[0], map, picture, limit, pitch);
-    for (size_t k = 0; k < blocks; ++k) {
-        const uint32_t* entries = map + k * kBlock;
-        uint8_t* to = dst + k * kBlock * 4;
+    const size_t whole = count & ~size_t{7};
+    size_t size = whole < kBlock ? whole : kBlock;
+    bool inside = FindOffsets(offsets[0], map, size, picture, limit, pitch);
+    size_t turn = 0;
+    for (size_t i = 0; i < whole; ++turn) {
+        const size_t next = i + size;
+        const size_t nextSize = whole - next < kBlock ? whole - next : kBlock;
         const bool nextInside =
-            k + 1 < blocks &&
-            FindOffsets(offsets[(k + 1) & 1], entries + kBlock, picture, limit, pitch);
+            FindOffsets(offsets[~turn & 1], map + next, nextSize, picture, limit, pitch);
         if (inside) {
-            DrawBlock(to, entries, offsets[k & 1], picture);
+            DrawBlock(dst + i * 4, map + i, size, offsets[turn & 1], picture);
         } else {
-            QuadSampleRow_sse2(to, entries, kBlock, picture);
+            QuadSampleRow_sse2(dst + i * 4, map + i, size, picture);
         }
+        i = next;
+        size = nextSize;
         inside = nextInside;
     }
-    const size_t done = blocks * kBlock;
-    QuadSampleRow_sse2(dst + done * 4, map + done, count - done, picture);
+    QuadSampleRow_scalar(dst + whole * 4, map + whole, count - whole, picture);
 }
 
 } // namespace kyv
