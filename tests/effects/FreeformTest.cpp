@@ -1,0 +1,685 @@
+// The free-form picture-in-picture through the callbacks, against a slow form that takes every pass
+// over the whole frame.
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <limits>
+#include <random>
+#include <thread>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "effects/pip/Rasterizer.h"
+#include "imageutility/Conversion.h"
+#include "imageutility/ImageUtility.h"
+#include "tests/support/TestHost.h"
+
+namespace {
+
+using namespace kyvtest;
+using namespace kyv;
+using namespace KYVImageUtility;
+
+const EffectDescriptor& Pip() {
+    return Effect("Kyv_Dsp_Pi_Freeform");
+}
+
+struct Params {
+    float corners[8] = {0.25F, 0.25F, 0.75F, 0.25F, 0.75F, 0.75F, 0.25F, 0.75F};
+    int32_t key = 1;
+    uint32_t keyColor = 0xFF00FF;
+    uint8_t tolerance = 0;
+    int32_t picture = 1;
+    uint8_t pictureAlpha = 255;
+    int32_t pictureBlur = 0;
+    int32_t shadow = 1;
+    uint32_t shadowColors[2] = {0, 0};
+    int32_t shadowType = 0;
+    uint8_t shadowAlpha = 128;
+    int32_t shadowBlur = 1;
+    float offset[2] = {0.01F, 0.01F};
+    int32_t border = 1;
+    int32_t borderSize = 5;
+    uint32_t borderColors[2] = {0x0000FF, 0x0000FF};
+    int32_t borderType = 0;
+    uint8_t borderAlpha = 255;
+    int32_t borderBlur = 0;
+};
+
+Params PictureOnly() {
+    Params params;
+    params.key = params.shadow = params.border = 0;
+    return params;
+}
+
+void Store(const Params& p, CTestInstance& instance) {
+    const char* const keys[] = {"P0", "P1", "P2", "P3", "P4", "P5", "P6", "P7"};
+    for (int i = 0; i < 8; ++i) {
+        instance.Set(keys[i], p.corners[i]);
+    }
+    instance.Set("P8", p.key);
+    instance.Set("P9", p.keyColor);
+    instance.Set("P10", p.tolerance);
+    instance.Set("P12", p.picture);
+    instance.Set("P13", p.pictureAlpha);
+    instance.Set("P14", p.pictureBlur);
+    instance.Set("P15", p.shadow);
+    instance.Set("P16", p.shadowColors[0]);
+    instance.Set("P17", p.shadowColors[1]);
+    instance.Set("P18", p.shadowType);
+    instance.Set("P19", p.shadowAlpha);
+    instance.Set("P20", p.shadowBlur);
+    instance.Set("P21", p.offset[0]);
+    instance.Set("P22", p.offset[1]);
+    instance.Set("P23", p.border);
+    instance.Set("P24", p.borderSize);
+    instance.Set("P25", p.borderColors[0]);
+    instance.Set("P26", p.borderColors[1]);
+    instance.Set("P27", p.borderType);
+    instance.Set("P28", p.borderAlpha);
+    instance.Set("P29", p.borderBlur);
+}
+
+// ---------------------------------------------------------------------------------- the slow form
+
+struct Bounds {
+    int left, top, right, bottom; // inside
+
+    bool Has(int x, int y) const { return x >= left && x <= right && y >= top && y <= bottom; }
+};
+
+class CSlowFrame {
+public:
+    CSlowFrame(const Params& params, int width, int height, bool ayuv)
+        : m_p(params), m_width(width), m_height(height), m_ayuv(ayuv) {
+        m_box = {99999, 99999, -99999, -99999};
+        for (int i = 0; i < 4; ++i) {
+            m_x[i] = static_cast<int>(params.corners[2 * i] * static_cast<float>(width));
+            m_y[i] = static_cast<int>(params.corners[2 * i + 1] * static_cast<float>(height));
+            m_box = {std::min(m_box.left, m_x[i]), std::min(m_box.top, m_y[i]),
+                     std::max(m_box.right, m_x[i]), std::max(m_box.bottom, m_y[i])};
+        }
+    }
+
+    Frame Render(const Frame& background, const Frame& foreground) {
+        const float sx = static_cast<float>(m_width) / 320.0F;
+        const float sy = static_cast<float>(m_height) / 240.0F;
+        const float mean = (sx + sy) / 2.0F;
+        const auto blur = [&](Frame& layer, int radius) {
+            Blur(layer, static_cast<int>(static_cast<float>(radius) * mean));
+        };
+        const int size = m_p.border ? static_cast<int>(static_cast<float>(m_p.borderSize) * sx) : 0;
+        const int dx = static_cast<int>(m_p.offset[0] * static_cast<float>(m_width));
+        const int dy = static_cast<int>(m_p.offset[1] * static_cast<float>(m_height));
+        const Bounds wide = {m_box.left - size, m_box.top - size, m_box.right + size,
+                             m_box.bottom + size};
+
+        Frame picture = Picture(foreground);
+        if (m_p.key) {
+            Key(picture);
+        }
+        Frame border(picture.size(), Clear()), shadow(picture.size(), Clear());
+        if (m_p.border) {
+            DrawBorder(border, size);
+            for (size_t i = 0; i < border.size(); ++i) {
+                if (picture[i] >> 24) {
+                    border[i] = Clear();
+                }
+            }
+            Gradient(border, wide, m_p.borderType, m_p.borderColors);
+        }
+        if (m_p.shadow) {
+            const auto stamp = [&](const Frame& layer) {
+                for (int y = 0; y < m_height; ++y) {
+                    for (int x = 0; x < m_width; ++x) {
+                        const int tx = x + dx, ty = y + dy;
+                        if (layer[At(x, y)] >> 24 && tx >= 0 && ty >= 0 && tx < m_width &&
+                            ty < m_height) {
+                            shadow[At(tx, ty)] = 0xFF000000 | Color(m_p.shadowColors[0]);
+                        }
+                    }
+                }
+            };
+            if (m_p.picture) {
+                stamp(picture);
+            }
+            stamp(border);
+            Gradient(shadow, {wide.left + dx, wide.top + dy, wide.right + dx, wide.bottom + dy},
+                     m_p.shadowType, m_p.shadowColors);
+            blur(shadow, m_p.shadowBlur);
+        }
+        blur(border, m_p.borderBlur);
+        blur(picture, m_p.pictureBlur);
+
+        Frame output = background;
+        const auto blend = [&](const Frame& layer, uint32_t opacity) {
+            for (size_t i = 0; i < output.size(); ++i) {
+                const uint32_t a = layer[i] >> 24;
+                const uint32_t w = opacity < 255 ? ((opacity + 1) * a) >> 8 : a;
+                uint32_t pixel = output[i] & 0xFF000000;
+                for (int shift = 0; shift < 24; shift += 8) {
+                    const uint32_t s = layer[i] >> shift & 255, d = output[i] >> shift & 255;
+                    pixel |= (s * w + d * (256 - w)) >> 8 << shift;
+                }
+                output[i] = pixel;
+            }
+        };
+        if (m_p.shadow) {
+            blend(shadow, m_p.shadowAlpha);
+        }
+        if (m_p.border) {
+            blend(border, m_p.borderAlpha);
+        }
+        if (m_p.picture) {
+            blend(picture, m_p.pictureAlpha);
+        }
+        return output;
+    }
+
+private:
+    size_t At(int x, int y) const { return static_cast<size_t>(y * m_width + x); }
+    uint32_t Clear() const { return m_ayuv ? 0x00108080 : 0; }
+
+    // A parameter's colour as the low 24 bits of a pixel.
+    uint32_t Color(uint32_t color) const {
+        uint32_t r = color & 255, g = color >> 8 & 255, b = color >> 16 & 255;
+        if (m_ayuv) {
+            RgbToYuv(r, g, b, &r, &g, &b);
+        }
+        return r << 16 | g << 8 | b;
+    }
+
+    // The positions that the rasterizer emits.
+    template <class Draw>
+    static std::vector<std::pair<int, int>> Emitted(Draw draw) {
+        static std::vector<std::pair<int, int>> stream;
+        stream.clear();
+        CRasterizer::SetPixelCallback(
+            [](const RasterPixel* p) { stream.emplace_back(p->x, p->y); });
+        draw();
+        return stream;
+    }
+
+    // One unknown of the inverse bilinear map: a z^2 + b z + c = 0.
+    static double Solve(double a, double b, double c) {
+        const double d = std::max(b * b - 4 * a * c, 0.0);
+        double z = a == 0 ? -c / b : (-b - std::sqrt(d)) / (2 * a);
+        z = z > 0 ? z : 0;
+        return z >= 1 ? 0.999 : z;
+    }
+
+    Frame Picture(const Frame& source) const {
+        Frame layer(source.size(), Clear());
+        const RasterPoint q[4] = {
+            {m_x[0], m_y[0]}, {m_x[1], m_y[1]}, {m_x[2], m_y[2]}, {m_x[3], m_y[3]}};
+        const double ex = q[1].x - q[0].x, ey = q[1].y - q[0].y;
+        const double fx = q[3].x - q[0].x, fy = q[3].y - q[0].y;
+        const double gx = q[0].x - q[1].x + q[2].x - q[3].x;
+        const double gy = q[0].y - q[1].y + q[2].y - q[3].y;
+        double area = 0;
+        for (int i = 0; i < 4; ++i) {
+            const RasterPoint& r = q[(i + 1) % 4];
+            area += static_cast<double>(q[i].x) * r.y - static_cast<double>(q[i].y) * r.x;
+        }
+        const double o = area < 0 ? -1 : 1;
+        for (const auto& [px, py] :
+             Emitted([&] { CRasterizer::FillQuad(&q[0], &q[1], &q[2], &q[3]); })) {
+            const int x = std::clamp(px, 0, m_width - 1), y = std::clamp(py, 0, m_height - 1);
+            if (!m_box.Has(x, y)) {
+                continue; // a quad outside the frame
+            }
+            const double hx = x - q[0].x, hy = y - q[0].y;
+            const double hg = hx * gy - hy * gx, ef = ex * fy - ey * fx;
+            const double s = Solve(o * (gx * ey - gy * ex), o * (hg - ef), o * (hx * fy - hy * fx));
+            const double t =
+                Solve(-o * (gx * fy - gy * fx), -o * (hg + ef), -o * (hx * ey - hy * ex));
+            const auto u = static_cast<uint16_t>(static_cast<int>(s * m_width * 64));
+            const auto v = static_cast<uint16_t>(static_cast<int>(t * m_height * 64));
+            if ((u >> 6) + 1 >= m_width || (v >> 6) + 1 >= m_height) {
+                continue;
+            }
+            uint32_t pixel = 0xFF000000;
+            for (int shift = 0; shift < 24; shift += 8) {
+                const auto at = [&](int dx, int dy) {
+                    return static_cast<int>(source[At((u >> 6) + dx, (v >> 6) + dy)] >> shift &
+                                            255);
+                };
+                const int fu = ((u & 63) << 10) >> 1, fv = ((v & 63) << 10) >> 1;
+                const int top = at(0, 0) + (fu * (at(1, 0) - at(0, 0)) >> 16);
+                const int bottom = at(0, 1) + (fu * (at(1, 1) - at(0, 1)) >> 16);
+                pixel |= static_cast<uint32_t>(top + (fv * (bottom - top) >> 16)) << shift;
+            }
+            layer[At(x, y)] = pixel;
+        }
+        return layer;
+    }
+
+    CImageARGB View(Frame& frame) const {
+        return {reinterpret_cast<uint8_t*>(frame.data()), m_width, m_height, m_width * 4};
+    }
+    CImageAYUV AyuvView(Frame& frame) const {
+        return {reinterpret_cast<uint8_t*>(frame.data()), m_width, m_height, m_width * 4};
+    }
+
+    void Key(Frame& layer) const {
+        Frame rgb = layer;
+        CImageARGB view = View(rgb);
+        if (m_ayuv) {
+            AyuvView(layer).ToARGB(view);
+        }
+        const auto mismatch = [&](int x, int y) {
+            const uint32_t pixel = rgb[At(std::min(x, m_width - 1), std::min(y, m_height - 1))];
+            for (int c = 0; c < 3; ++c) {
+                const int value = static_cast<int>(pixel >> (8 * c) & 255);
+                const int key = static_cast<int>(m_p.keyColor >> (16 - 8 * c) & 255);
+                if (std::abs(value - key) > m_p.tolerance) {
+                    return 64;
+                }
+            }
+            return 0;
+        };
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = 0; x < m_width; ++x) {
+                uint32_t& pixel = rgb[At(x, y)];
+                if (pixel >> 24) {
+                    const int sum = mismatch(x, y) + mismatch(x + 1, y) + mismatch(x, y + 1) +
+                                    mismatch(x + 1, y + 1);
+                    pixel = (pixel & 0xFFFFFF) | static_cast<uint32_t>(std::min(sum, 255)) << 24;
+                }
+            }
+        }
+        layer = rgb;
+        if (m_ayuv) {
+            CImageAYUV target = AyuvView(layer);
+            view.ToAYUV(target);
+        }
+    }
+
+    void DrawBorder(Frame& layer, int size) const {
+        const float h = static_cast<float>(size / 2);
+        RasterPointF corner[4], normal[4];
+        for (int i = 0; i < 4; ++i) {
+            corner[i] = {static_cast<float>(m_x[i]), static_cast<float>(m_y[i])};
+        }
+        for (int i = 0; i < 4; ++i) {
+            const RasterPointF d = {corner[(i + 1) % 4].x - corner[i].x,
+                                    corner[(i + 1) % 4].y - corner[i].y};
+            const float x = d.x * d.x + d.y * d.y;
+            float r = x > 0 ? 1 / std::sqrt(x) : 0;
+            r = r * (x * r * r - 3.0F) * -0.5F;
+            normal[i] = {d.y * r, -d.x * r};
+        }
+        const auto moved = [&](int i, int n, float by) {
+            return RasterPointF{corner[i].x + normal[n].x * by, corner[i].y + normal[n].y * by};
+        };
+        const auto stream = Emitted([&] {
+            for (int i = 0; i < 4; ++i) {
+                const int next = (i + 1) % 4, before = (i + 3) % 4;
+                const RasterPointF a = moved(i, i, h), b = moved(next, i, h),
+                                   c = moved(next, i, -h), d = moved(i, i, -h);
+                CRasterizer::FillQuadF(&a, &b, &c, &d);
+                const float turn = normal[before].x * normal[i].y - normal[before].y * normal[i].x;
+                const float side = turn < 0 ? -h : h;
+                const RasterPointF from = moved(i, before, side), to = moved(i, i, side);
+                CRasterizer::FillTriangleF(&corner[i], &from, &to);
+                CRasterizer::FillCircle(m_x[i], m_y[i], size / 2 - 1);
+            }
+        });
+        const uint32_t color = 0xFF000000 | Color(m_p.borderColors[0]);
+        for (const auto& [x, y] : stream) {
+            if (x >= 0 && y >= 0 && x < m_width && y < m_height) {
+                layer[At(x, y)] = color;
+            }
+        }
+    }
+
+    void Gradient(Frame& layer, const Bounds& box, int type, const uint32_t (&colors)[2]) const {
+        const uint32_t c1 = Color(colors[0]), c2 = Color(colors[1]);
+        if (c1 == c2 || box.left >= box.right || box.top >= box.bottom) {
+            return;
+        }
+        // Where the second colour lies, and how far the corners are from it: 0, 1 or 2 halves.
+        constexpr int kFar[8][4] = {{0, 0, 2, 2}, {2, 2, 0, 0}, {0, 2, 0, 2}, {2, 0, 2, 0},
+                                    {0, 1, 1, 2}, {1, 0, 2, 1}, {1, 2, 0, 1}, {2, 1, 1, 0}};
+        const int* far = kFar[type >= 0 && type < 8 ? type : 0];
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = 0; x < m_width; ++x) {
+                uint32_t& pixel = layer[At(x, y)];
+                if (pixel >> 24 == 0) {
+                    continue;
+                }
+                const float fx =
+                    static_cast<float>(x - box.left) / static_cast<float>(box.right - box.left);
+                const float fy =
+                    static_cast<float>(y - box.top) / static_cast<float>(box.bottom - box.top);
+                uint32_t result = pixel & 0xFF000000;
+                for (int shift = 0; shift < 24; shift += 8) {
+                    const int a = static_cast<int>(c2 >> shift & 255);
+                    const int b = static_cast<int>(c1 >> shift & 255);
+                    const int values[3] = {a, (a + b) >> 1, b};
+                    const auto mix = [](int from, int to, float part) {
+                        return static_cast<int>(static_cast<float>(from) +
+                                                static_cast<float>(to - from) * part);
+                    };
+                    const int top = mix(values[far[0]], values[far[1]], fx);
+                    const int bottom = mix(values[far[2]], values[far[3]], fx);
+                    const int value = std::clamp(mix(top, bottom, fy), 0, 255);
+                    result |= static_cast<uint32_t>(value) << shift;
+                }
+                pixel = result;
+            }
+        }
+    }
+
+    void Blur(Frame& layer, int radius) const {
+        if (radius > 0) {
+            CImageARGB view = View(layer);
+            view.BoxBlur(view, radius);
+        }
+    }
+
+    Params m_p;
+    int m_width, m_height;
+    bool m_ayuv;
+    int m_x[4], m_y[4];
+    Bounds m_box;
+};
+
+Frame RenderEffect(const Params& params, const Frame& background, const Frame& foreground,
+                   int width, int height, uint32_t format, int32_t level) {
+    CTestInstance instance(Pip(), static_cast<uint32_t>(width), static_cast<uint32_t>(height));
+    instance.Context().cpuLevel = level;
+    instance.Context().pixelFormat = format;
+    EXPECT_EQ(instance.Begin(), KYV_OK);
+    Store(params, instance);
+    Frame output(background.size(), 0x55555555);
+    EXPECT_EQ(instance.Render(output.data(), background.data(), foreground.data()), KYV_OK);
+    return output;
+}
+
+// Mostly sensible settings, with every switch and list.
+Params RandomParams(std::mt19937& random, float reach) {
+    const auto part = [&](float from, float to) {
+        return from + (to - from) * static_cast<float>(random() % 10001) / 10000.0F;
+    };
+    const auto number = [&](uint32_t most) { return static_cast<int32_t>(random() % (most + 1)); };
+    Params p;
+    for (float& corner : p.corners) {
+        corner = part(0.5F - reach, 0.5F + reach);
+    }
+    if (random() % 4 == 0) { // a rectangle
+        p.corners[3] = p.corners[1];
+        p.corners[4] = p.corners[2];
+        p.corners[6] = p.corners[0];
+        p.corners[7] = p.corners[5];
+    }
+    const auto color = [&] { return static_cast<uint32_t>(random()) & 0xFFFFFF; };
+    p.key = number(1);
+    p.keyColor = color();
+    p.tolerance = static_cast<uint8_t>(random() % 128);
+    p.picture = random() % 5 != 0;
+    p.pictureAlpha = static_cast<uint8_t>(random() % 3 ? 255 : random());
+    p.pictureBlur = random() % 3 ? 0 : number(10);
+    p.shadow = number(1);
+    p.shadowColors[0] = color();
+    p.shadowColors[1] = random() % 2 ? color() : p.shadowColors[0];
+    p.shadowType = number(8);
+    p.shadowAlpha = static_cast<uint8_t>(random());
+    p.shadowBlur = number(10);
+    p.offset[0] = part(-0.3F, 0.3F);
+    p.offset[1] = part(-0.3F, 0.3F);
+    p.border = number(1);
+    p.borderSize = number(10);
+    p.borderColors[0] = color();
+    p.borderColors[1] = random() % 2 ? color() : p.borderColors[0];
+    p.borderType = number(8);
+    p.borderAlpha = static_cast<uint8_t>(random());
+    p.borderBlur = random() % 2 ? 0 : number(5);
+    return p;
+}
+
+// A picture of few colours in patches, so that keys match.
+Frame PatchedFrame(int width, int height, uint32_t seed, uint32_t keyColor) {
+    std::mt19937 random(seed);
+    const uint32_t key = (keyColor & 255) << 16 | (keyColor & 0xFF00) | keyColor >> 16;
+    Frame frame = RandomFrame(static_cast<size_t>(width * height), seed);
+    for (int i = 0; i < 12; ++i) {
+        const int left = static_cast<int>(random()) % width,
+                  top = static_cast<int>(random()) % height;
+        for (int y = std::abs(top); y < std::min(std::abs(top) + 9, height); ++y) {
+            for (int x = std::abs(left); x < std::min(std::abs(left) + 11, width); ++x) {
+                frame[static_cast<size_t>(y * width + x)] = key ^ (random() % 4 * 0x030507);
+            }
+        }
+    }
+    return frame;
+}
+
+TEST(Freeform, EveryLevelMatchesTheSlowForm) {
+    std::mt19937 random(1);
+    for (uint32_t i = 0; i < 160; ++i) {
+        const int width = 1 + static_cast<int>(random() % (i % 8 ? 150 : 500));
+        const int height = 1 + static_cast<int>(random() % 120);
+        const Params params = RandomParams(random, i % 3 ? 0.5F : 1.2F);
+        const uint32_t format = i % 2;
+        const Frame background = RandomFrame(static_cast<size_t>(width * height), i);
+        const Frame foreground = PatchedFrame(width, height, i + 1000, params.keyColor);
+        const Frame expected = CSlowFrame(params, width, height, format == PixelFormat_Ayuv)
+                                   .Render(background, foreground);
+        for (const int32_t level : {0, 3, 4, 5}) {
+            const Frame actual =
+                RenderEffect(params, background, foreground, width, height, format, level);
+            const auto at = std::mismatch(actual.begin(), actual.end(), expected.begin());
+            ASSERT_EQ(at.first - actual.begin(), width * height)
+                << "case " << i << ", level " << level << ", " << width << "x" << height << ": "
+                << std::hex << *at.first << ", not " << *at.second;
+        }
+    }
+}
+
+TEST(Freeform, DefaultCornersAreTheMiddleHalf) {
+    // Picture 200 over background 100 at full weight: (200 * 255 + 100) >> 8 = 199. The last column
+    // and row of a picture up to 1000 wide stay empty.
+    const Frame background(640 * 480, 0x80646464), foreground(640 * 480, 0x00C8C8C8);
+    const Frame output = RenderEffect(PictureOnly(), background, foreground, 640, 480, 0, 5);
+    for (int y = 0; y < 480; ++y) {
+        for (int x = 0; x < 640; ++x) {
+            const bool inside = x >= 160 && x < 480 && y >= 120 && y < 360;
+            ASSERT_EQ(output[static_cast<size_t>(y * 640 + x)], inside ? 0x80C7C7C7 : 0x80646464)
+                << x << ',' << y;
+        }
+    }
+}
+
+TEST(Freeform, KeyCountsTheTwoByTwoBlock) {
+    // A 4 x 2 picture on a 4 x 2 frame; columns 0 to 2 are drawn, and row 0. Magenta in column 1
+    // leaves two of four at column 0 and at column 1.
+    Params params = PictureOnly();
+    const float all[8] = {0, 0, 1, 0, 1, 1, 0, 1};
+    std::copy(all, all + 8, params.corners);
+    params.key = 1;
+    const Frame background(8, 0x00000000);
+    Frame foreground(8, 0xFF808080);
+    foreground[1] = foreground[5] = 0xFFFF00FF;
+    const Frame output = RenderEffect(params, background, foreground, 4, 2, 0, 0);
+    // Row 1 is empty and black, so it does not match: column 0 has 3 of 4, column 1 too.
+    // 128 * 192 >> 8 = 96 and 255 * 192 >> 8 = 191; column 2 has 128 * 255 >> 8 = 127.
+    EXPECT_THAT(output, testing::ElementsAre(0x606060U, 0xBF00BFU, 0x7F7F7FU, 0U, 0U, 0U, 0U, 0U));
+}
+
+TEST(Freeform, WithoutASecondInputTheBackgroundIsCopied) {
+    const Frame background = RandomFrame(20 * 10, 3);
+    CTestInstance instance(Pip(), 20, 10);
+    ASSERT_EQ(instance.Begin(), KYV_OK);
+    Frame output(200);
+    EXPECT_EQ(instance.Render(output.data(), background.data()), KYV_OK);
+    EXPECT_EQ(output, background);
+    EXPECT_EQ(instance.Render(output.data(), nullptr, background.data()), KYV_FAIL);
+    EXPECT_EQ(instance.Render(nullptr, background.data(), background.data()), KYV_FAIL);
+    instance.Context().width = 0;
+    EXPECT_EQ(instance.Render(output.data(), background.data(), background.data()), KYV_FAIL);
+}
+
+TEST(Freeform, TheOutputMayBeEitherInput) {
+    std::mt19937 random(5);
+    for (const int32_t level : {0, 5}) {
+        const Params params = RandomParams(random, 0.5F);
+        const Frame background = RandomFrame(60 * 40, 1), foreground = RandomFrame(60 * 40, 2);
+        const Frame expected = RenderEffect(params, background, foreground, 60, 40, 0, level);
+        for (const bool first : {true, false}) {
+            CTestInstance instance(Pip(), 60, 40);
+            instance.Context().cpuLevel = level;
+            ASSERT_EQ(instance.Begin(), KYV_OK);
+            Store(params, instance);
+            Frame back = background, front = foreground;
+            Frame& output = first ? back : front;
+            EXPECT_EQ(instance.Render(output.data(), back.data(), front.data()), KYV_OK);
+            EXPECT_EQ(output, expected);
+        }
+    }
+}
+
+TEST(Freeform, ViewsAndFieldsLeaveTheRestAlone) {
+    std::mt19937 random(6);
+    constexpr int kWidth = 50, kHeight = 31;
+    for (const uint32_t format : {0U, 1U}) {
+        const Params params = RandomParams(random, 0.5F);
+        const Frame background = RandomFrame(2 * kWidth * kHeight, 1);
+        const Frame foreground = RandomFrame(2 * kWidth * kHeight, 2);
+        const auto view = [&](const Frame& frame, uint32_t layout) {
+            Frame part;
+            for (int y = 0; y < kHeight; ++y) {
+                const auto from = frame.begin() + y * 2 * kWidth + (layout == 2 ? kWidth : 0);
+                part.insert(part.end(), from, from + kWidth);
+            }
+            return part;
+        };
+        for (const uint32_t layout : {1U, 2U}) {
+            const Frame whole = RenderEffect(params, view(background, layout),
+                                             view(foreground, layout), kWidth, kHeight, format, 0);
+            for (const uint32_t field : {0U, 1U, 2U}) {
+                for (const int32_t level : {0, 5}) {
+                    CTestInstance instance(Pip(), kWidth, kHeight);
+                    instance.Context().cpuLevel = level;
+                    instance.Context().pixelFormat = format;
+                    instance.Context().stereoLayout = layout;
+                    instance.Context().fieldSelector = field;
+                    ASSERT_EQ(instance.Begin(), KYV_OK);
+                    Store(params, instance);
+                    Frame output(background.size(), 7);
+                    ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()),
+                              KYV_OK);
+                    Frame expected = output;
+                    for (int y = 0; y < kHeight; ++y) {
+                        const bool drawn = field == 0 || y % 2 == static_cast<int>(field) - 1;
+                        auto to = expected.begin() + y * 2 * kWidth;
+                        std::fill_n(to, 2 * kWidth, 7);
+                        if (drawn) {
+                            std::copy_n(whole.begin() + y * kWidth, kWidth,
+                                        to + (layout == 2 ? kWidth : 0));
+                        }
+                    }
+                    ASSERT_EQ(output, expected) << layout << ' ' << field << ' ' << level;
+                }
+            }
+        }
+    }
+}
+
+// What an instance has drawn before must not show.
+TEST(Freeform, FramesDoNotDependOnThoseBefore) {
+    std::mt19937 random(7);
+    for (int round = 0; round < 6; ++round) {
+        CTestInstance instance(Pip(), 1, 1);
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        Params params = RandomParams(random, 0.5F);
+        for (int i = 0; i < 25; ++i) {
+            const int width = 30 + static_cast<int>(random() % 3) * 25;
+            const int height = 20 + static_cast<int>(random() % 2) * 30;
+            if (random() % 3 == 0) {
+                params = RandomParams(random, 0.6F);
+            }
+            EffectContext& context = instance.Context();
+            context.width = static_cast<uint32_t>(width);
+            context.height = static_cast<uint32_t>(height);
+            context.pixelFormat = random() % 4 == 0;
+            context.cpuLevel = static_cast<int32_t>(random() % 6);
+            Store(params, instance);
+            const auto pixels = static_cast<size_t>(width * height);
+            const Frame background = RandomFrame(pixels, static_cast<uint32_t>(i));
+            const Frame foreground = RandomFrame(pixels, static_cast<uint32_t>(i) + 50);
+            Frame output(pixels);
+            ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()), KYV_OK);
+            ASSERT_EQ(output, RenderEffect(params, background, foreground, width, height,
+                                           context.pixelFormat, 5))
+                << "round " << round << " frame " << i;
+            if (i == 12) {
+                EXPECT_EQ(instance.End(), KYV_OK);
+                EXPECT_EQ(instance.End(), KYV_OK); // and the next frame works all the same
+            }
+        }
+    }
+}
+
+TEST(Freeform, InstancesOnSeveralThreadsAreIndependent) {
+    std::vector<std::thread> threads;
+    for (uint32_t seed = 0; seed < 4; ++seed) {
+        threads.emplace_back([seed] {
+            std::mt19937 random(seed);
+            const int size = 24 + static_cast<int>(seed) * 9;
+            const auto pixels = static_cast<size_t>(size * size);
+            const Frame background = RandomFrame(pixels, 1), foreground = RandomFrame(pixels, 2);
+            for (int round = 0; round < 8; ++round) {
+                const Params params = RandomParams(random, 0.5F);
+                EXPECT_EQ(RenderEffect(params, background, foreground, size, size, 0, 0),
+                          RenderEffect(params, background, foreground, size, size, 0, 5));
+            }
+        });
+    }
+    for (std::thread& thread : threads) {
+        thread.join();
+    }
+}
+
+TEST(Freeform, SurvivesAnyParameters) {
+    std::mt19937 random(8);
+    constexpr float kInfinity = std::numeric_limits<float>::infinity();
+    const float floats[] = {NAN,   kInfinity, -kInfinity, 1e30F, -1e30F, 1e6F, -1e6F,
+                            60.0F, -3.5F,     0.0F,       -0.0F, 0.5F,   1.0F, 1e-40F};
+    constexpr std::pair<int, int> kSizes[] = {{1, 1},  {1, 40},   {40, 1},   {2, 2},    {64, 48},
+                                              {33, 7}, {1100, 3}, {3, 1100}, {8200, 2}, {2, 8200}};
+    for (int i = 0; i < 150; ++i) {
+        const auto [width, height] = kSizes[static_cast<size_t>(i) % std::size(kSizes)];
+        const auto pixels = static_cast<size_t>(width) * static_cast<size_t>(height);
+        // Corners from the list, some equal or collinear; everything else any bits at all.
+        Params params = RandomParams(random, 0.5F);
+        for (float& corner : params.corners) {
+            if (random() % 3) {
+                corner = floats[random() % std::size(floats)];
+            }
+        }
+        if (i % 2) {
+            const auto any = [&] { return static_cast<int32_t>(random() << 16 ^ random()); };
+            params.pictureBlur = random() % 2 ? any() : 40;
+            params.shadowBlur = random() % 2 ? any() : 1000;
+            params.borderBlur = random() % 2 ? any() : -1;
+            params.borderSize = random() % 2 ? any() : 300;
+            params.shadowType = any();
+            params.borderType = any();
+            params.key = params.picture = params.shadow = params.border = any();
+            params.keyColor = static_cast<uint32_t>(any());
+            params.tolerance = static_cast<uint8_t>(any());
+            params.shadowColors[0] = static_cast<uint32_t>(any());
+            params.offset[0] = floats[random() % std::size(floats)];
+            params.offset[1] = floats[random() % std::size(floats)];
+        }
+        const Frame background = RandomFrame(pixels, 1), foreground = RandomFrame(pixels, 2);
+        const uint32_t format = static_cast<uint32_t>(i) / 2 % 2;
+        EXPECT_EQ(RenderEffect(params, background, foreground, width, height, format, 0),
+                  RenderEffect(params, background, foreground, width, height, format, 5))
+            << "case " << i;
+    }
+}
+
+} // namespace
