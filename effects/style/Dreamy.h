@@ -1,0 +1,31 @@
+// Dreamy: a soft glow over the picture, or a part of it.
+//
+//   "P1"  byte   degree 1..40: strength and radius of the glow
+//   "P2"  mask   left, top, right, bottom in fractions of the frame; all zero is the whole frame
+//   "P3"  int    1 treats the ellipse inside that rectangle, any other value the rectangle
+//   "P4"  float  width of the soft rim, 0..0.4 of the frame's shorter side
+//   "P5"  int    non-zero treats the outside
+#pragma once
+
+#include <cstdint>
+
+#include "effects/style/GpuPath.h"
+#include "module/HostInterface.h"
+
+namespace kyv {
+
+struct Dreamy {
+    struct Instance {
+        void* input;
+        GpuBinding gpu;
+        void* reserved;
+    };
+    static_assert(sizeof(Instance) == 48);
+
+    static constexpr uint32_t kInputCount = 1;
+    static void Begin(EffectContext& context, Instance& instance);
+    static KyvStatus Process(EffectContext& context, Instance& instance);
+    static void Release(EffectContext& context, Instance& instance);
+};
+
+} // namespace kyv

@@ -1,0 +1,28 @@
+// Light ray: shafts of light that stream from the bright parts of the picture.
+//
+//   "P1"  byte      degree 0..30: length and strength; 0 leaves the picture as it is
+//   "P2"  position  the light's place in fractions of the frame; it may lie outside
+#pragma once
+
+#include <cstdint>
+
+#include "effects/style/GpuPath.h"
+#include "module/HostInterface.h"
+
+namespace kyv {
+
+struct LightRay {
+    struct Instance {
+        void* input;
+        GpuBinding gpu;
+        uint8_t reserved[424];
+    };
+    static_assert(sizeof(Instance) == 464);
+
+    static constexpr uint32_t kInputCount = 1;
+    static void Begin(EffectContext& context, Instance& instance);
+    static KyvStatus Process(EffectContext& context, Instance& instance);
+    static void Release(EffectContext& context, Instance& instance);
+};
+
+} // namespace kyv

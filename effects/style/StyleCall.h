@@ -1,0 +1,21 @@
+// What the callbacks of the style effects share: parameters as filters and GPU helpers may have
+// them.
+#pragma once
+
+#include <cstdint>
+
+#include "effects/style/StyleMask.h"
+#include "module/FrameGeometry.h"
+#include "module/GpuHelper.h"
+#include "module/HostInterface.h"
+#include "module/ParamReader.h"
+
+namespace kyv {
+
+// The four mask parameters, which lie one after the other: rectangle, shape, depth, inverse.
+// Normalised.
+MaskShape ReadMask(const CParamReader& params, uint32_t firstIndex);
+
+GpuMask ToGpuMask(const MaskShape& mask);
+
+} // namespace kyv
