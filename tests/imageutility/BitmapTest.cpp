@@ -2,10 +2,12 @@
 #include "imageutility/Bitmap.h"
 
 #include <array>
+#include <atomic>
 #include <cstring>
 #include <fstream>
 #include <iterator>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -150,6 +152,30 @@ TEST(Resource, MissingOnesLeaveTheDestination) {
     BitmapToImage(destination.Image(), nullptr);
     destination.Check();
     EXPECT_EQ(GetBitmapBits32(nullptr, 1, nullptr), 0U);
+}
+
+// Instances load their pictures when they begin, each on a thread of its own.
+TEST(Resource, LoadsOnSeveralThreadsAtOnce) {
+    const Bytes bitmap = ExpectedBitmap("Bitmap140.bmp", 640, 480);
+    CImageARGB picture;
+    LoadPngResource(picture, kyv::OwnLibrary(), "PNG", 145);
+    std::atomic<int> wrong = 0;
+    std::vector<std::thread> threads;
+    for (int i = 0; i < 4; ++i) {
+        threads.emplace_back([&] {
+            for (int round = 0; round < 5; ++round) {
+                CImageARGB first;
+                CImageARGB second;
+                LoadPngResource(first, kyv::OwnLibrary(), "PNG", 145);
+                LoadBitmapResource(second, kyv::OwnLibrary(), 140);
+                wrong += PixelsOf(first) != PixelsOf(picture) || PixelsOf(second) != bitmap;
+            }
+        });
+    }
+    for (std::thread& thread : threads) {
+        thread.join();
+    }
+    EXPECT_EQ(wrong, 0);
 }
 
 TEST(BitmapBits, AreInTheRowOrderAsked) {
