@@ -22,6 +22,7 @@ struct BilinearScratch {
         rowSteps = layout.Take<uint32_t>(static_cast<size_t>(height) + 1);
         left = layout.Take<int32_t>(columns);
         weights = layout.Take<uint8_t>(columns * 2);
+        shuffles = layout.Take<uint8_t>(columns * 8);
         rows[0] = layout.Take<uint8_t>(columns * 4);
         rows[1] = layout.Take<uint8_t>(columns * 4);
     }
@@ -31,6 +32,7 @@ struct BilinearScratch {
     uint32_t* rowSteps;
     int32_t* left;
     uint8_t* weights;
+    uint8_t* shuffles;
     uint8_t* rows[2]; // source rows at the destination's width
 };
 
@@ -73,7 +75,11 @@ bool ResizeBilinear(const CImageARGB& source, const CImageARGB& destination) {
     BuildResizeSteps(scratch.rowSteps, source.GetHeight(), height);
     // Added up once, so that the row loops need not.
     ExpandResizeSteps(scratch.left, scratch.weights, scratch.columnSteps, width);
-    const kyv::BilinearColumns columns = {.left = scratch.left, .weights = scratch.weights};
+    const kyv::BilinearColumns columns = {
+        .left = scratch.left,
+        .weights = scratch.weights,
+        .shuffles = scratch.shuffles,
+        .shuffled = BuildResizeShuffles(scratch.shuffles, scratch.left, width, source.GetWidth())};
     CBilinearRows rows(source, scratch, columns, width);
     const kyv::LerpRow lerp = FormFor(kyv::kLerp, source);
     const auto count = static_cast<size_t>(width);

@@ -45,4 +45,21 @@ void ExpandResizeSteps(int32_t* left, uint8_t* weights, const uint32_t* entries,
     }
 }
 
+size_t BuildResizeShuffles(uint8_t* shuffles, const int32_t* left, int32_t count, int32_t source) {
+    int32_t i = 0;
+    for (; i + 2 <= count; i += 2) {
+        const int32_t gap = left[i + 1] - left[i];
+        if (gap > 2 || left[i] + 4 > source) {
+            break;
+        }
+        for (const int32_t first : {0, gap * 4}) {
+            for (int32_t c = first; c < first + 4; ++c) {
+                *shuffles++ = static_cast<uint8_t>(c);
+                *shuffles++ = static_cast<uint8_t>(c + 4);
+            }
+        }
+    }
+    return static_cast<size_t>(i);
+}
+
 } // namespace KYVImageUtility

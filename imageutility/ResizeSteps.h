@@ -2,6 +2,7 @@
 // row, to the next.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 
 namespace KYVImageUtility {
@@ -29,5 +30,10 @@ void BuildResizeSteps(uint32_t* entries, int32_t source, int32_t destination);
 // Adds up the steps of count destination positions: for each the left neighbour, and the weights
 // 128 - f and f of both neighbours.
 void ExpandResizeSteps(int32_t* left, uint8_t* weights, const uint32_t* entries, int32_t count);
+
+// Writes the indices that BilinearColumns describes, 16 for every two of count positions, and
+// returns how many positions have them: up to the first two that do not come from four pixels in
+// a row inside the source.
+size_t BuildResizeShuffles(uint8_t* shuffles, const int32_t* left, int32_t count, int32_t source);
 
 } // namespace KYVImageUtility

@@ -12,6 +12,11 @@ namespace kyv {
 struct BilinearColumns {
     const int32_t* left;    // for every destination pixel, the left one of two source pixels
     const uint8_t* weights; // and the weights of both in 1/128: 128 - f, f; f is 0..127
+    // For each two of the first pixels, 16 indices into the four source pixels from the first's
+    // left one on: the bytes of both their neighbour pairs, interleaved. An even number of pixels
+    // have them; vector forms need not use them.
+    const uint8_t* shuffles = nullptr;
+    size_t shuffled = 0;
 };
 
 // count pixels: each channel is a + (((b - a) * f) >> 7), rounded toward minus infinity, of two

@@ -73,7 +73,10 @@ void ResizeRows(kyv::BilinearRow form, const KernelBuffers& buffers) {
     std::vector<uint8_t> weights(left.size() * 2);
     KYVImageUtility::BuildResizeSteps(steps.data(), source.size.width, width);
     KYVImageUtility::ExpandResizeSteps(left.data(), weights.data(), steps.data(), width);
-    const kyv::BilinearColumns columns = {left.data(), weights.data()};
+    std::vector<uint8_t> shuffles(left.size() * 8);
+    const size_t shuffled = KYVImageUtility::BuildResizeShuffles(shuffles.data(), left.data(),
+                                                                 width, source.size.width);
+    const kyv::BilinearColumns columns = {left.data(), weights.data(), shuffles.data(), shuffled};
     for (int32_t y = 0; y < buffers.size.height; ++y) {
         form(buffers.dst + y * buffers.dstPitch, source.pixels + y * source.pitch, left.size(),
              columns);
