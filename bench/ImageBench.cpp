@@ -38,6 +38,40 @@ void AddOperation(const char* name, Operate operate) {
     }
 }
 
+// A part of a frame, for what is as large as a 1280 x 720 picture.
+CImageARGB Small(const CImageARGB& image) {
+    CImageARGB view(image.GetBuffer(), 1280, 720, 1280 * 4);
+    view.SetCpuLevel(image.GetCpuLevel());
+    return view;
+}
+
+void AddBlends() {
+    AddOperation("image AlphaBlend",
+                 [](Images& images) { images.argb[1].AlphaBlend(images.argb[0], 200); });
+    AddOperation("image AddBlend",
+                 [](Images& images) { images.argb[1].AddBlend(images.argb[0], 200); });
+    AddOperation("image ScreenBlend",
+                 [](Images& images) { images.argb[1].ScreenBlend(images.argb[0]); });
+    AddOperation("image CompositeOver",
+                 [](Images& images) { images.argb[1].CompositeOver(images.argb[0], 200); });
+}
+
+void AddResizing() {
+    AddOperation("image Resize 720p to 1080p",
+                 [](Images& images) { Small(images.argb[0]).Resize(images.argb[1], 0); });
+    AddOperation("image Resize 1080p to 720p", [](Images& images) {
+        CImageARGB small = Small(images.argb[1]);
+        images.argb[0].Resize(small, 0);
+    });
+}
+
+void AddBlurs() {
+    for (const int32_t radius : {1, 10, 50, 100, 500}) {
+        AddOperation(("image BoxBlur " + std::to_string(radius)).c_str(),
+                     [radius](Images& images) { images.argb[0].BoxBlur(images.argb[1], radius); });
+    }
+}
+
 } // namespace
 
 void AddImageOperations() {
@@ -45,6 +79,9 @@ void AddImageOperations() {
                  [](Images& images) { images.ayuv[0].ToARGB(images.argb[1]); });
     AddOperation("image ARGB to AYUV",
                  [](Images& images) { images.argb[0].ToAYUV(images.ayuv[1]); });
+    AddBlends();
+    AddResizing();
+    AddBlurs();
 }
 
 } // namespace kyvbench
