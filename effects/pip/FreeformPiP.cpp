@@ -96,33 +96,59 @@ void CFreeformPiP::SetFilterIndex(int32_t index) {
     m_bDirty = true;
 }
 
+bool CFreeformPiP::PictureOf(const CImageARGB& source, SamplePicture& picture) const {
+    picture = {source.GetBuffer(), source.GetPitch(), source.GetWidth(), source.GetHeight()};
+    return m_bSizeSet && source.GetBuffer() && source.GetWidth() == m_nSourceWidth &&
+           source.GetHeight() == m_nSourceHeight;
+}
+
 int32_t CFreeformPiP::Render(const CImageARGB& source, CImageARGB& destination) {
-    if (!source.GetBuffer() || source.GetWidth() != m_nSourceWidth ||
-        source.GetHeight() != m_nSourceHeight) {
-        return 0;
-    }
-    return Draw({source.GetBuffer(), source.GetPitch(), m_nSourceWidth, m_nSourceHeight},
-                destination, Renderer::Picture);
+    SamplePicture picture;
+    return PictureOf(source, picture) ? DrawOn(destination, picture, Renderer::Picture) : 0;
+}
+
+int32_t CFreeformPiP::RenderRows(const CImageARGB& source, CRowTarget& target) {
+    SamplePicture picture;
+    return PictureOf(source, picture)
+               ? Draw(picture, target, source.GetCpuLevel(), Renderer::Picture)
+               : 0;
 }
 
 int32_t CFreeformPiP::RenderCheckerboard(CImageARGB& destination) {
     if (m_nMapMode != MapMode_Nearest && m_nMapMode != MapMode_Bilinear) {
         return 0;
     }
-    return Draw({}, destination, Renderer::Checkerboard);
+    return DrawOn(destination, {}, Renderer::Checkerboard);
 }
 
-// The images that are drawn from and on, for the length of a drawing, however it ends.
+int32_t CFreeformPiP::DrawOn(CImageARGB& destination, const SamplePicture& picture,
+                             Renderer renderer) {
+    class CImageRows final : public CRowTarget {
+    public:
+        explicit CImageRows(const CImageARGB& image) : m_image(image) {}
+        uint8_t* Row(int32_t y) override { return m_image.Row(y); }
+
+    private:
+        const CImageARGB& m_image;
+    };
+    if (!m_bSizeSet || !destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
+        destination.GetHeight() != m_nDestHeight) {
+        return 0;
+    }
+    CImageRows rows(destination);
+    return Draw(picture, rows, destination.GetCpuLevel(), renderer);
+}
+
+// What is drawn from and on, for the length of a drawing, however it ends.
 class CFreeformPiP::CDrawing {
 public:
-    CDrawing(CFreeformPiP& pip, const SamplePicture& picture, CImageARGB& destination)
-        : m_pip(pip) {
+    CDrawing(CFreeformPiP& pip, const SamplePicture& picture, CRowTarget& target) : m_pip(pip) {
         m_pip.m_picture = picture;
-        m_pip.m_pDestination = &destination;
+        m_pip.m_pTarget = &target;
     }
     ~CDrawing() {
         m_pip.m_picture = {};
-        m_pip.m_pDestination = nullptr;
+        m_pip.m_pTarget = nullptr;
     }
     CDrawing(const CDrawing&) = delete;
     CDrawing& operator=(const CDrawing&) = delete;
@@ -131,12 +157,8 @@ private:
     CFreeformPiP& m_pip;
 };
 
-int32_t CFreeformPiP::Draw(const SamplePicture& picture, CImageARGB& destination,
+int32_t CFreeformPiP::Draw(const SamplePicture& picture, CRowTarget& target, int32_t cpuLevel,
                            Renderer renderer) {
-    if (!m_bSizeSet || !destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
-        destination.GetHeight() != m_nDestHeight) {
-        return 0;
-    }
     if (m_nMapMode < MapMode_Nearest || m_nMapMode > MapMode_Filtered) {
         return 1;
     }
@@ -147,8 +169,8 @@ int32_t CFreeformPiP::Draw(const SamplePicture& picture, CImageARGB& destination
         ToFloat(m_sourcePoints, source);
         m_model.Set(quad, source);
     }
-    const InstructionSet set = Resolve(destination.GetCpuLevel());
-    const CDrawing drawing(*this, picture, destination);
+    const InstructionSet set = Resolve(cpuLevel);
+    const CDrawing drawing(*this, picture, target);
     m_renderer = renderer;
     m_pMapRow = kQuadMapRow.For(set);
     m_pSampleRow = kQuadSampleRow.For(set);
@@ -215,7 +237,7 @@ void CFreeformPiP::DrawThroughCallback(const RasterPoint (&quad)[4], const Raste
 }
 
 void CFreeformPiP::BuildPixel(const RasterPixel& pixel) {
-    if (m_pDestination) {
+    if (m_pTarget) {
         BuildSpan(std::clamp(pixel.x, 0, m_nDestWidth - 1),
                   std::clamp(pixel.y, 0, m_nDestHeight - 1), 1);
     }
@@ -224,7 +246,7 @@ void CFreeformPiP::BuildPixel(const RasterPixel& pixel) {
 // The callback stays installed after a drawing, and pixels that somebody else emits then find
 // nothing to draw on.
 void CFreeformPiP::RenderPixel(const RasterPixel& pixel) {
-    if (m_pDestination) {
+    if (m_pTarget) {
         RenderSpan(std::clamp(pixel.x, 0, m_nDestWidth - 1),
                    std::clamp(pixel.y, 0, m_nDestHeight - 1), 1);
     }
@@ -283,7 +305,7 @@ void CFreeformPiP::BuildFiltered(int32_t x, int32_t y, size_t count) {
 }
 
 void CFreeformPiP::RenderSpan(int32_t x, int32_t y, size_t count) {
-    uint8_t* dst = m_pDestination->Row(y) + ptrdiff_t{4} * x;
+    uint8_t* dst = m_pTarget->Row(y) + ptrdiff_t{4} * x;
     const auto first =
         static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
     const uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();

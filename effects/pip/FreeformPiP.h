@@ -25,6 +25,16 @@
 
 namespace kyv {
 
+// Where rows of the frame are drawn.
+class CRowTarget {
+public:
+    // The first pixel of a row of the frame.
+    virtual uint8_t* Row(int32_t y) = 0;
+
+protected:
+    ~CRowTarget() = default;
+};
+
 class CFreeformPiP {
 public:
     enum : int32_t {
@@ -71,6 +81,11 @@ public:
     int32_t Render(const KYVImageUtility::CImageARGB& source,
                    KYVImageUtility::CImageARGB& destination);
 
+    // Draws into rows that the target gives, without what Render has to say about a destination. At
+    // level 3 or above their turns come from top to bottom, and rows that the quad does not meet
+    // have none.
+    int32_t RenderRows(const KYVImageUtility::CImageARGB& source, CRowTarget& target);
+
     // The quad as a checkerboard, to show the map. Needs a map of one entry a pixel, so it returns
     // 0 in modes 1, 3 and 4.
     int32_t RenderCheckerboard(KYVImageUtility::CImageARGB& destination);
@@ -89,8 +104,11 @@ private:
     enum class Renderer { Picture, Checkerboard };
     class CDrawing;
 
-    int32_t Draw(const SamplePicture& picture, KYVImageUtility::CImageARGB& destination,
+    int32_t DrawOn(KYVImageUtility::CImageARGB& destination, const SamplePicture& picture,
+                   Renderer renderer);
+    int32_t Draw(const SamplePicture& picture, CRowTarget& target, int32_t cpuLevel,
                  Renderer renderer);
+    bool PictureOf(const KYVImageUtility::CImageARGB& source, SamplePicture& picture) const;
     void Allocate();
     void DrawThroughCallback(const RasterPoint (&quad)[4], const RasterWindow& window);
     void BuildSpan(int32_t x, int32_t y, size_t count);
@@ -122,7 +140,7 @@ private:
 
     // While drawing: what to read, where to write, and with which forms.
     SamplePicture m_picture = {};
-    KYVImageUtility::CImageARGB* m_pDestination = nullptr;
+    CRowTarget* m_pTarget = nullptr;
     Renderer m_renderer = Renderer::Picture;
     QuadMapRow m_pMapRow = nullptr;
     QuadSampleRow m_pSampleRow = nullptr;

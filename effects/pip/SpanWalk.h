@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
+#include <vector>
 
 #include "effects/pip/Rasterizer.h"
 #include "platform/WrapMath.h"
@@ -145,29 +146,63 @@ public:
     }
 
     // emit(y, first, last) for spans that together are the shape with every position outside moved
-    // to the nearest one inside.
+    // to the nearest one inside. Rows come top to bottom.
     template <class Emit>
     void ClampQuad(const RasterPoint (&quad)[4], Emit&& emit) const {
-        ClampTriangle({quad[0], quad[1], quad[2]}, emit);
-        ClampTriangle({quad[0], quad[2], quad[3]}, emit);
+        ClampTriangles({{quad[0], quad[1], quad[2]}, {quad[0], quad[2], quad[3]}}, emit);
     }
 
     template <class Emit>
     void ClampTriangle(const RasterPoint (&vertices)[3], Emit&& emit) const {
-        ForHalves(vertices,
-                  [&](const CTriangleSide& a, const CTriangleSide& b, int64_t top, int64_t bottom) {
-                      Collapse(a, b, top, std::min<int64_t>(bottom, m_window.top - int64_t{1}),
-                               m_window.top, emit);
-                      const int64_t end = std::min<int64_t>(bottom, m_window.bottom);
-                      for (int64_t y = std::max<int64_t>(top, m_window.top); y <= end; ++y) {
-                          EmitHull(a, b, y, y, static_cast<int32_t>(y), emit);
-                      }
-                      Collapse(a, b, std::max<int64_t>(top, m_window.bottom + int64_t{1}), bottom,
-                               m_window.bottom, emit);
-                  });
+        ClampTriangles({{vertices[0], vertices[1], vertices[2]}}, emit);
     }
 
 private:
+    // The rows of a triangle above or below its middle vertex.
+    struct Half {
+        CTriangleSide a;
+        CTriangleSide b;
+        int64_t top;
+        int64_t bottom;
+    };
+
+    template <size_t N, class Emit>
+    void ClampTriangles(const RasterPoint (&triangles)[N][3], Emit&& emit) const {
+        std::vector<Half> halves;
+        halves.reserve(2 * N);
+        int64_t first = m_window.bottom;
+        int64_t last = m_window.top;
+        for (const auto& vertices : triangles) {
+            ForHalves(vertices, [&](const CTriangleSide& a, const CTriangleSide& b, int64_t top,
+                                    int64_t bottom) {
+                halves.push_back({a, b, top, bottom});
+                first = std::min(first, top);
+                last = std::max(last, bottom);
+            });
+        }
+        first = std::max<int64_t>(first, m_window.top);
+        last = std::min<int64_t>(last, m_window.bottom);
+        for (int64_t y = first; y <= last; ++y) {
+            for (const Half& half : halves) {
+                ClampRow(half, y, emit);
+            }
+        }
+    }
+
+    template <class Emit>
+    void ClampRow(const Half& half, int64_t y, Emit&& emit) const {
+        const auto target = static_cast<int32_t>(y);
+        if (y == m_window.top) {
+            Collapse(half.a, half.b, half.top, std::min(half.bottom, y - 1), target, emit);
+        }
+        if (y >= half.top && y <= half.bottom) {
+            EmitHull(half.a, half.b, y, y, target, emit);
+        }
+        if (y == m_window.bottom) {
+            Collapse(half.a, half.b, std::max(half.top, y + 1), half.bottom, target, emit);
+        }
+    }
+
     // half(a, b, top, bottom): the sides and rows above and below the middle vertex.
     template <class Half>
     static void ForHalves(const RasterPoint (&vertices)[3], Half&& half) {
