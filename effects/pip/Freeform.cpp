@@ -5,8 +5,10 @@
 #include <cstring>
 
 #include "effects/pip/FreeformPiP.h"
+#include "effects/pip/PictureRows.h"
 #include "effects/pip/PipLayers.h"
 #include "imageutility/Conversion.h"
+#include "imageutility/kernels/AlphaBlend.h"
 #include "module/FrameGeometry.h"
 #include "module/ParamReader.h"
 
@@ -41,9 +43,7 @@ struct LayerSettings {
 
 struct Settings {
     RasterPoint corners[4];
-    bool keyEnabled;
-    uint32_t key; // 0x00RRGGBB
-    uint8_t tolerance;
+    PictureKey key;
     LayerSettings picture; // without colours
     LayerSettings shadow;
     int32_t shadowX, shadowY;
@@ -83,10 +83,9 @@ Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometr
         s.corners[i] = {ToPixels(params.Float(2 * i), geometry.width),
                         ToPixels(params.Float(2 * i + 1), geometry.height)};
     }
-    s.keyEnabled = params.Int(8) != 0;
     const uint32_t key = params.Color(9);
-    s.key = (key & 255) << 16 | (key & 0xFF00) | (key >> 16 & 255);
-    s.tolerance = params.Byte(10);
+    s.key = {params.Int(8) != 0, (key & 255) << 16 | (key & 0xFF00) | (key >> 16 & 255),
+             params.Byte(10)};
     s.picture.enabled = params.Int(12) != 0;
     s.picture.alpha = params.Byte(13);
     s.picture.blur = Scale(params.Int(14), scaleBlur);
@@ -121,6 +120,59 @@ RasterWindow BoundCorners(const RasterPoint (&corners)[4]) {
     return box;
 }
 
+CImageARGB ViewOf(void* frame, const FrameGeometry& geometry, int32_t cpuLevel) {
+    CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
+                    geometry.height, geometry.pitchBytes);
+    view.SetCpuLevel(cpuLevel);
+    return view;
+}
+
+// The output's rows. Those of a field that the call does not treat are left as they are.
+class COutput final : public CRowSink {
+public:
+    COutput(const EffectContext& context, const CImageARGB& image, const CImageARGB& background)
+        : m_image(image), m_background(background), m_field(context.fieldSelector),
+          m_blend(kAlphaBlend.For(Resolve(context.cpuLevel))) {}
+
+    // Copies a row of the background. Null for a row that is not treated.
+    uint8_t* BeginRow(int32_t y) const {
+        if (m_field == (y % 2 ? FieldSelector_First : FieldSelector_Second)) {
+            return nullptr;
+        }
+        uint8_t* row = m_image.Row(y);
+        if (row != m_background.Row(y)) {
+            std::memcpy(row, m_background.Row(y), static_cast<size_t>(m_image.GetWidth()) * 4);
+        }
+        return row;
+    }
+
+    void CopyRows(int32_t first, int32_t end) const {
+        for (int32_t y = first; y < end; ++y) {
+            BeginRow(y);
+        }
+    }
+
+    // Where and how the rows of a picture alone go.
+    void SetPicture(const PixelBox& box, uint8_t alpha) {
+        m_box = box;
+        m_alpha = alpha;
+    }
+    void Take(int32_t y, const uint8_t* pixels) override {
+        if (uint8_t* row = BeginRow(y)) {
+            m_blend(row + ptrdiff_t{4} * m_box.left, pixels, static_cast<size_t>(m_box.Width()),
+                    m_alpha);
+        }
+    }
+
+private:
+    const CImageARGB& m_image;
+    const CImageARGB& m_background;
+    uint32_t m_field;
+    AlphaBlendRow m_blend;
+    PixelBox m_box = {};
+    uint8_t m_alpha = 0;
+};
+
 // One frame's work. What is drawn is the same as if every pass went over the whole frame.
 class CFrameWork {
 public:
@@ -130,6 +182,58 @@ public:
         m_quadBox = {box.left, box.top, box.right + 1, box.bottom + 1};
         m_gradientBox =
             PixelBox{box.left, box.top, box.right, box.bottom}.Grown(settings.borderSize);
+    }
+
+    // The output may be the frame of either input: the layers are made before it is written, and
+    // what is written row by row needs a foreground of its own.
+    void Render(const CImageARGB& foreground, COutput& output, bool sharesForeground) {
+        const int32_t width = foreground.GetWidth();
+        const int32_t height = foreground.GetHeight();
+        const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
+        m_pip.SetSize(width, height, width, height);
+        m_pip.SetSourcePoints(source, 4);
+        m_pip.SetDestPoints(m_settings.corners, 4);
+        const bool alone = m_settings.picture.enabled && m_settings.picture.blur == 0 &&
+                           !m_settings.border.enabled && !m_settings.shadow.enabled;
+        if (alone && !sharesForeground &&
+            Resolve(foreground.GetCpuLevel()) != InstructionSet::Scalar) {
+            RenderPictureAlone(foreground, output);
+            return;
+        }
+        MakeLayers(foreground);
+        for (int32_t y = 0; y < height; ++y) {
+            if (uint8_t* row = output.BeginRow(y)) {
+                BlendRow(row, y);
+            }
+        }
+    }
+
+private:
+    PixelBox Frame() const { return m_work.picture.Frame(); }
+
+    void RenderPictureAlone(const CImageARGB& foreground, COutput& output) {
+        // The layer does not get what the map will have.
+        m_work.picture.Outdate();
+        const PixelBox frame = {0, 0, foreground.GetWidth(), foreground.GetHeight()};
+        const PixelBox box = PictureBox(frame);
+        if (box.IsEmpty()) {
+            output.CopyRows(0, frame.bottom);
+            return;
+        }
+        output.CopyRows(0, box.top);
+        output.SetPicture(box, m_settings.picture.alpha);
+        CPictureRows rows(frame.right, box, m_settings.key, m_ayuv, foreground.GetCpuLevel(),
+                          output);
+        m_pip.RenderRows(foreground, rows);
+        rows.Finish();
+        output.CopyRows(box.bottom, frame.bottom);
+    }
+
+    // Where the picture can be, with the neighbours that the key looks at; empty for a quad outside
+    // the frame.
+    PixelBox PictureBox(const PixelBox& frame) const {
+        const PixelBox inside = m_quadBox.CutTo(frame);
+        return inside.IsEmpty() ? PixelBox{} : inside.Grown(1).CutTo(frame);
     }
 
     void MakeLayers(const CImageARGB& foreground) {
@@ -164,29 +268,20 @@ public:
         }
     }
 
-private:
-    PixelBox Frame() const { return m_work.picture.Frame(); }
-
     void RenderPicture(const CImageARGB& foreground) {
         CPipLayer& layer = m_work.picture;
-        const int32_t width = foreground.GetWidth();
-        const int32_t height = foreground.GetHeight();
-        const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
-        m_pip.SetSize(width, height, width, height);
-        m_pip.SetSourcePoints(source, 4);
-        m_pip.SetDestPoints(m_settings.corners, 4);
         // Through the same map the same pixels are drawn again, and the others are still clear.
         if (m_pip.IsDirty() || !layer.Fits(foreground, m_ayuv)) {
             layer.Reset(foreground, m_ayuv);
         }
-        if (m_quadBox.CutTo(Frame()).IsEmpty()) {
+        const PixelBox box = PictureBox(Frame());
+        if (box.IsEmpty()) {
             return;
         }
-        // With the neighbours that the key looks at.
-        layer.Use(m_quadBox.Grown(1));
+        layer.Use(box);
         m_pip.Render(foreground, layer.Image());
-        if (m_settings.keyEnabled) {
-            layer.ColorKey(m_settings.key, m_settings.tolerance);
+        if (m_settings.key.enabled) {
+            layer.ColorKey(m_settings.key.color, m_settings.key.tolerance);
         }
     }
 
@@ -232,13 +327,6 @@ private:
     PixelBox m_gradientBox; // widened by the border; its right and bottom are inside
 };
 
-CImageARGB ViewOf(void* frame, const FrameGeometry& geometry, int32_t cpuLevel) {
-    CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
-                    geometry.height, geometry.pitchBytes);
-    view.SetCpuLevel(cpuLevel);
-    return view;
-}
-
 void Prepare(Freeform::Instance& instance) {
     if (!instance.pip) {
         instance.pip = new CFreeformPiP;
@@ -261,26 +349,17 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     }
     const CImageARGB output = ViewOf(context.frame, geometry, context.cpuLevel);
     const CImageARGB background = ViewOf(instance.background, geometry, context.cpuLevel);
+    COutput rows(context, output, background);
+    if (!instance.foreground) {
+        rows.CopyRows(0, geometry.height);
+        return KYV_OK;
+    }
     const bool ayuv = context.pixelFormat == PixelFormat_Ayuv;
     const Settings settings = ReadSettings(context, geometry, ayuv);
     Prepare(instance);
     CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
-    // Before the background is copied: the output may be the frame of either input.
-    if (instance.foreground) {
-        work.MakeLayers(ViewOf(instance.foreground, geometry, context.cpuLevel));
-    }
-    // Single fields leave the rows of the other one as they are.
-    const bool second = context.fieldSelector == FieldSelector_Second;
-    const int32_t step = second || context.fieldSelector == FieldSelector_First ? 2 : 1;
-    for (int32_t y = second ? 1 : 0; y < geometry.height; y += step) {
-        uint8_t* row = output.Row(y);
-        if (row != background.Row(y)) {
-            std::memcpy(row, background.Row(y), static_cast<size_t>(geometry.width) * 4);
-        }
-        if (instance.foreground) {
-            work.BlendRow(row, y);
-        }
-    }
+    work.Render(ViewOf(instance.foreground, geometry, context.cpuLevel), rows,
+                instance.foreground == context.frame);
     return KYV_OK;
 }
 

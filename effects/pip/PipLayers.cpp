@@ -35,18 +35,18 @@ void CPipLayer::Reset(const CImageARGB& frame, bool ayuv) {
         m_used = Frame();
     }
     m_bAyuv = ayuv;
-    m_bBlurred = false;
+    m_bFresh = true;
     m_image.SetCpuLevel(frame.GetCpuLevel());
     m_pBlendRow = FormFor(kAlphaBlend, m_image);
     for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
         auto* row = reinterpret_cast<uint32_t*>(At(m_image, m_used.left, y));
-        std::fill_n(row, std::max(m_used.Width(), 0), Clear());
+        std::fill_n(row, std::max(m_used.Width(), 0), ClearPixel(ayuv));
     }
     m_used = {};
 }
 
 bool CPipLayer::Fits(const CImageARGB& frame, bool ayuv) const {
-    return m_image.GetBuffer() && m_image.IsSameSize(frame) && ayuv == m_bAyuv && !m_bBlurred &&
+    return m_image.GetBuffer() && m_image.IsSameSize(frame) && ayuv == m_bAyuv && m_bFresh &&
            m_image.GetCpuLevel() == frame.GetCpuLevel();
 }
 
@@ -149,7 +149,7 @@ void CPipLayer::Blur(const PixelBox& content, int32_t radius) {
     m_image.GetSubImage(view, part.left, part.top, part.Width(), part.Height());
     view.SetCpuLevel(m_image.GetCpuLevel());
     view.BoxBlur(view, radius);
-    m_bBlurred = true;
+    Outdate();
     const PixelBox reach = content.Grown(radius).CutTo(Frame());
     m_used = {std::min(m_used.left, reach.left), std::min(m_used.top, reach.top),
               std::max(m_used.right, reach.right), std::max(m_used.bottom, reach.bottom)};

@@ -48,13 +48,20 @@ struct LayerColor {
     bool operator==(const LayerColor&) const = default;
 };
 
+// Transparent black.
+constexpr uint32_t ClearPixel(bool ayuv) {
+    return ayuv ? 0x00108080 : 0;
+}
+
 class CPipLayer {
 public:
     // Gives the layer the form of a frame and clears it. Throws std::bad_alloc.
     void Reset(const KYVImageUtility::CImageARGB& frame, bool ayuv);
-    // True when the layer has that form already and has not been blurred since it was cleared: what
-    // is drawn at the same places then needs no clearing before.
+    // True when the layer has that form already and shows nothing but what has been drawn since it
+    // was cleared: to draw at the same places again then needs no clearing before.
     bool Fits(const KYVImageUtility::CImageARGB& frame, bool ayuv) const;
+    // The places have changed without a drawing.
+    void Outdate() { m_bFresh = false; }
 
     KYVImageUtility::CImageARGB& Image() { return m_image; }
     PixelBox Frame() const { return {0, 0, m_image.GetWidth(), m_image.GetHeight()}; }
@@ -64,7 +71,7 @@ public:
     void Use(const PixelBox& box) { m_used = box.CutTo(Frame()); }
 
     // Clears the layer wherever another one is covered.
-    void ClearUnder(const CPipLayer& layer) { Stamp(layer, 0, 0, Clear()); }
+    void ClearUnder(const CPipLayer& layer) { Stamp(layer, 0, 0, ClearPixel(m_bAyuv)); }
 
     // Writes a pixel wherever another layer, moved by (dx, dy), is covered. Only what falls into
     // the part in use is written.
@@ -89,11 +96,9 @@ public:
     void BlendRow(uint8_t* frameRow, int32_t y, uint8_t opacity) const;
 
 private:
-    uint32_t Clear() const { return m_bAyuv ? 0x00108080 : 0; }
-
     KYVImageUtility::CImageARGB m_image;
     bool m_bAyuv = false;
-    bool m_bBlurred = false;
+    bool m_bFresh = false;
     AlphaBlendRow m_pBlendRow = nullptr;
     PixelBox m_used = {};
     std::vector<float> m_columns; // of gradients

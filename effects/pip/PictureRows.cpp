@@ -1,0 +1,51 @@
+// The picture row by row.
+#include "effects/pip/PictureRows.h"
+
+#include <algorithm>
+
+namespace kyv {
+
+CPictureRows::CPictureRows(int32_t width, const PixelBox& box, const PictureKey& key, bool ayuv,
+                           int32_t cpuLevel, CRowSink& sink)
+    : m_width(static_cast<size_t>(width)), m_box(box), m_key(key), m_bAyuv(ayuv), m_sink(sink),
+      m_pKeyRow(kColorKeyRow.For(Resolve(cpuLevel))), m_pToArgb(kToARGB.For(Resolve(cpuLevel))),
+      m_pToAyuv(kToAYUV.For(Resolve(cpuLevel))), m_rows(2 * m_width, ClearPixel(ayuv)),
+      m_nNext(box.top) {}
+
+uint8_t* CPictureRows::Row(int32_t y) {
+    // The row above this one is complete, but it may still be looked at.
+    while (m_nNext < y - 1) {
+        FinishRow();
+    }
+    return reinterpret_cast<uint8_t*>(Slot(y));
+}
+
+void CPictureRows::Finish() {
+    while (m_nNext < m_box.bottom) {
+        FinishRow();
+    }
+}
+
+void CPictureRows::FinishRow() {
+    const int32_t y = m_nNext++;
+    const auto count = static_cast<size_t>(m_box.Width());
+    uint8_t* row = Pixels(y);
+    if (m_key.enabled) {
+        const bool last = y + 1 == m_box.bottom;
+        uint8_t* below = last ? row : Pixels(y + 1);
+        if (m_bAyuv && y == m_box.top) {
+            m_pToArgb(row, row, count);
+        }
+        if (m_bAyuv && !last) {
+            m_pToArgb(below, below, count);
+        }
+        m_pKeyRow(row, below, count, m_key.color, m_key.tolerance);
+        if (m_bAyuv) {
+            m_pToAyuv(row, row, count);
+        }
+    }
+    m_sink.Take(y, row);
+    std::fill_n(Slot(y) + m_box.left, count, ClearPixel(m_bAyuv));
+}
+
+} // namespace kyv
