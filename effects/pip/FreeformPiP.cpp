@@ -308,6 +308,10 @@ void CFreeformPiP::RenderSpan(int32_t x, int32_t y, size_t count) {
     uint8_t* dst = m_pTarget->Row(y) + ptrdiff_t{4} * x;
     const auto first =
         static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
+    if (m_renderer == Renderer::Picture && m_nMapMode == MapMode_Filtered) {
+        RenderFiltered(dst, m_records.data() + first * 2, count, m_picture);
+        return;
+    }
     const uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();
     if (m_renderer == Renderer::Checkerboard) {
         RenderChecker(dst, map, count);
@@ -322,9 +326,6 @@ void CFreeformPiP::RenderSpan(int32_t x, int32_t y, size_t count) {
         break;
     case MapMode_GridBilinear:
         RenderGridBilinear(dst, map, count, m_picture);
-        break;
-    case MapMode_Filtered:
-        RenderFiltered(dst, m_records.data() + first * 2, count, m_picture);
         break;
     default:
         m_pSampleRow(dst, map, count, m_picture);
