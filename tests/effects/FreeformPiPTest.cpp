@@ -246,7 +246,7 @@ TEST(FreeformPiP, FilteredModeReducesAndKeepsFlatAreas) {
 
 TEST(FreeformPiP, EveryLevelDrawsTheSame) {
     std::mt19937 random(4);
-    for (int i = 0; i < 250; ++i) {
+    for (int i = 0; i < 120; ++i) {
         const auto size = [&](int most) { return 1 + static_cast<int>(random() % most); };
         Scene scene = {size(70), size(50), size(90), size(60), {}};
         const int reach = i % 10 == 0 ? kFarthestPoint : 200;

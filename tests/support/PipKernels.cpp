@@ -61,7 +61,7 @@ void AddQuads(std::vector<KernelEntry>& list) {
             return [model = RandomQuad(seed), left = static_cast<int>(seed % 80) -
                                                      40](auto form, const KernelBuffers& buffers) {
                 std::vector<uint32_t> map(static_cast<size_t>(buffers.size.width));
-                for (int32_t y = 0; y < buffers.size.height; ++y) {
+                for (int32_t y = 0; y < buffers.size.height && !map.empty(); ++y) {
                     form(map.data(), left, map.size(), model.PlanRow(y));
                     std::memcpy(buffers.dst + y * buffers.dstPitch, map.data(), map.size() * 4);
                 }
