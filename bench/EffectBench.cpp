@@ -31,6 +31,7 @@ struct EffectCase {
     std::vector<Setting> settings = {};
     int32_t startMs = 0;                 // playing begins here and goes on at 30 frames a second
     std::vector<Setting> alternate = {}; // every other frame has these
+    uint32_t threads = 1;
 };
 
 // The picture-in-picture over the whole frame or half of it, without anything else.
@@ -74,6 +75,9 @@ const EffectCase kCases[] = {
      {{"P0", 0.26F}}},
     {"pip all", "Kyv_Dsp_Pi_Freeform", PictureWithAll()},
     {"pip all moving", "Kyv_Dsp_Pi_Freeform", PictureWithAll(), 0, {{"P0", 0.11F}}},
+    {"alpha transition", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}},
+    {"alpha transition, 2 threads", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}, 0, {}, 2},
+    {"test alpha transition", "DSP_TR_TestAlpha", {{"P1", 0.5F}}},
 };
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units
@@ -121,7 +125,7 @@ public:
         m_context.height = kHeight;
         m_context.pixelFormat = format;
         m_context.cpuLevel = level;
-        m_context.threadCount = 1;
+        m_context.threadCount = what.threads;
         m_context.position = int64_t{what.startMs} * 10'000;
         m_context.duration = int64_t{60} * 10'000'000;
         m_ready = effect.callbacks.InitInstance(&m_context) == KYV_OK;

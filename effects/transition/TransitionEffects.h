@@ -1,11 +1,52 @@
-// The mask transitions.
+// The mask transitions: a wipe from input 0 to input 1 where a grey-level picture says when.
+//
+//   "P1"  float    percentage, 0 input 0 .. 1 input 1
+//   "P2"  int      smoothness, 0..40: half the width of the soft band, in grey levels
+//   "P3"  colour   of the border
+//   "P4"  boolean  border: tints the soft band
+//
+// Low grey levels change first. The mask is fitted to the frame's display shape in
+// BeginProcessing. On one thread a frame whose display aspect differs from its shape is resized to
+// that shape, blended there and resized back.
 #pragma once
 
-#include "effects/PassThrough.h"
+#include "module/HostInterface.h"
 
 namespace kyv {
 
-struct TestAlpha : PassThrough<32, 2, kRequestA> {};
-struct AlphaTransition : PassThrough<40, 2, kRequestA> {};
+class CMaskTransition;
+class CThreadPool;
+
+// Bitmap 113; on the calling thread, whatever the host's thread count.
+struct TestAlpha {
+    struct Instance {
+        void* inputs[2];
+        void* output;
+        CMaskTransition* mask; // owned
+    };
+    static_assert(sizeof(Instance) == 32);
+
+    static constexpr uint32_t kInputCount = 2;
+    static KyvStatus Begin(EffectContext& context, Instance& instance);
+    static KyvStatus Process(EffectContext& context, Instance& instance);
+    static void Release(EffectContext& context, Instance& instance);
+};
+
+// Bitmap 140. With a thread count of 2 or more the frame is blended in bands of rows, and then
+// without any regard to the display aspect.
+struct AlphaTransition {
+    struct Instance {
+        void* inputs[2];
+        void* output;
+        CMaskTransition* mask; // owned
+        CThreadPool* pool;     // owned
+    };
+    static_assert(sizeof(Instance) == 40);
+
+    static constexpr uint32_t kInputCount = 2;
+    static KyvStatus Begin(EffectContext& context, Instance& instance);
+    static KyvStatus Process(EffectContext& context, Instance& instance);
+    static void Release(EffectContext& context, Instance& instance);
+};
 
 } // namespace kyv

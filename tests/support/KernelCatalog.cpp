@@ -94,6 +94,7 @@ std::vector<KernelEntry> MakeCatalog() {
     AddImageOperations(list);
     AddParticles(list);
     AddPip(list);
+    AddTransitions(list);
     return list;
 }
 

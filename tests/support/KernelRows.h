@@ -55,5 +55,6 @@ inline constexpr auto kInPlaceOnly = [](uint32_t) {
 void AddImageOperations(std::vector<KernelEntry>& list);
 void AddParticles(std::vector<KernelEntry>& list);
 void AddPip(std::vector<KernelEntry>& list);
+void AddTransitions(std::vector<KernelEntry>& list);
 
 } // namespace kyvtest

@@ -1,0 +1,175 @@
+// Frames through a mask, on one thread or in bands of rows.
+#include "effects/transition/MaskTransition.h"
+
+#include <algorithm>
+#include <cstring>
+#include <vector>
+
+#include "effects/transition/MaskBlend.h"
+#include "imageutility/Bitmap.h"
+#include "imageutility/Conversion.h"
+#include "module/FrameGeometry.h"
+#include "module/ParamReader.h"
+#include "threading/RowBand.h"
+
+namespace kyv {
+namespace {
+
+using KYVImageUtility::CImageARGB;
+using KYVImageUtility::CImageByte;
+
+constexpr int32_t kRed = 2;
+constexpr int32_t kBilinear = 0;
+constexpr int32_t kLeastScalable = 2; // pixels each way
+// A display shape this many times as wide or narrow as the frame is not meant.
+constexpr int64_t kMostStretch = 16;
+
+struct DisplayShape {
+    int32_t width; // the height is the frame's
+    bool differs;  // by the aspect alone: the width may come out the same all the same
+};
+
+DisplayShape GetDisplayShape(const EffectContext& context, const FrameGeometry& geometry) {
+    const uint64_t aspectX = context.displayAspectX != 0 ? context.displayAspectX : context.width;
+    const uint64_t aspectY = context.displayAspectY != 0 ? context.displayAspectY : context.height;
+    if (context.width * aspectY == context.height * aspectX) {
+        return {geometry.width, false};
+    }
+    const auto width = static_cast<int64_t>(aspectX * context.height / aspectY);
+    const bool usable = width >= kLeastScalable && width <= kMostStretch * geometry.width &&
+                        width * kMostStretch >= geometry.width;
+    return usable ? DisplayShape{static_cast<int32_t>(width), true}
+                  : DisplayShape{geometry.width, false};
+}
+
+CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry, void* frame) {
+    CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
+                    geometry.height, geometry.pitchBytes);
+    view.SetCpuLevel(context.cpuLevel);
+    return view;
+}
+
+MaskBlendParams ReadParams(const EffectContext& context) {
+    const CParamReader reader(context);
+    const uint32_t color = reader.Color(2);
+    uint32_t first = color & 0xFF, second = color >> 8 & 0xFF, third = color >> 16 & 0xFF;
+    if (context.pixelFormat == PixelFormat_Ayuv) {
+        KYVImageUtility::RgbToYuv(first, second, third, &first, &second, &third);
+    }
+    // Bytes run B, G, R or V, U, Y.
+    return {.percentage = reader.Float(0),
+            .smoothness = reader.Int(1),
+            .hasBorder = reader.Byte(3) != 0,
+            .edge = {static_cast<uint8_t>(third), static_cast<uint8_t>(second),
+                     static_cast<uint8_t>(first)}};
+}
+
+// One frame's blend, all that the bands share.
+struct BlendJob {
+    const CImageARGB& output;
+    const CImageARGB& picture0;
+    const CImageARGB& picture1;
+    const CImageByte& mask;
+    MaskBlendRow row;
+    MaskBlend blend;
+
+    static uint32_t RunBand(void* argument) {
+        const auto* band = static_cast<const RowBand*>(argument);
+        static_cast<const BlendJob*>(band->owner)->BlendRows(band->firstRow, band->endRow);
+        return kOk;
+    }
+
+    // Where the frame is larger than the mask, the mask's last column and row go on.
+    void BlendRows(int32_t first, int32_t end) const {
+        const auto width = static_cast<size_t>(output.GetWidth());
+        const auto known = std::min(width, static_cast<size_t>(mask.GetWidth()));
+        std::vector<uint8_t> widened(known < width ? width : 0);
+        for (int32_t y = first; y < end; ++y) {
+            const uint8_t* values = mask.Row(std::min(y, mask.GetHeight() - 1));
+            if (known < width) {
+                std::memcpy(widened.data(), values, known);
+                std::memset(widened.data() + known, values[known - 1], width - known);
+                values = widened.data();
+            }
+            row(output.Row(y), picture0.Row(y), picture1.Row(y), values, width, blend);
+        }
+    }
+};
+
+void EnsureSize(CImageARGB& image, int32_t width, int32_t height) {
+    if (image.GetWidth() != width || image.GetHeight() != height) {
+        image.Create(width, height);
+    }
+}
+
+} // namespace
+
+bool CMaskTransition::LoadMask(const EffectContext& context, uint16_t bitmapId) {
+    if (!context.descriptor || !context.descriptor->module) {
+        return false;
+    }
+    CImageARGB bitmap;
+    bitmap.SetCpuLevel(context.cpuLevel);
+    LoadBitmapResource(bitmap, context.descriptor->module->ModuleHandle, bitmapId);
+    if (!bitmap.GetBuffer()) {
+        return false;
+    }
+    FrameGeometry geometry;
+    if (!GetFrameGeometry(context, geometry)) {
+        return true;
+    }
+    // A frame of one column or row uses the first of two.
+    CImageARGB fitted(std::max(GetDisplayShape(context, geometry).width, kLeastScalable),
+                      std::max(geometry.height, kLeastScalable));
+    if (!fitted.GetBuffer() || !bitmap.TryResize(fitted, kBilinear)) {
+        throw std::bad_alloc();
+    }
+    // A quarter of the memory to read for every frame.
+    m_mask.Create(fitted.GetWidth(), fitted.GetHeight());
+    fitted.GetChannel(m_mask, kRed);
+    return true;
+}
+
+void CMaskTransition::Render(const EffectContext& context, void* output, void* const* inputs,
+                             CThreadPool* pool) {
+    FrameGeometry geometry;
+    if (!m_mask.GetBuffer() || !output || !GetFrameGeometry(context, geometry)) {
+        return;
+    }
+    if (!inputs[0] || !inputs[1]) {
+        if (const void* single = inputs[0] ? inputs[0] : inputs[1]) {
+            CopyView(geometry, output, single);
+        }
+        return;
+    }
+    CImageARGB target = ViewOf(context, geometry, output);
+    const CImageARGB picture0 = ViewOf(context, geometry, inputs[0]);
+    const CImageARGB picture1 = ViewOf(context, geometry, inputs[1]);
+    BlendJob job = {
+        target, picture0, picture1, m_mask, kMaskBlendRow.For(Resolve(context.cpuLevel)), {}};
+    BuildMaskBlend(job.blend, ReadParams(context));
+    if (pool && context.threadCount >= 2) {
+        RunRowBands(*pool, context.threadCount, geometry.height, BlendJob::RunBand, &job);
+        return;
+    }
+    const DisplayShape shape = GetDisplayShape(context, geometry);
+    if (!shape.differs || geometry.width < kLeastScalable || geometry.height < kLeastScalable) {
+        job.BlendRows(0, geometry.height);
+        return;
+    }
+    for (int i = 0; i < 2; ++i) {
+        EnsureSize(m_scaled[i], shape.width, geometry.height);
+        m_scaled[i].SetCpuLevel(context.cpuLevel);
+        const CImageARGB& picture = i == 0 ? picture0 : picture1;
+        if (!picture.TryResize(m_scaled[i], kBilinear)) {
+            throw std::bad_alloc();
+        }
+    }
+    const BlendJob scaledJob = {m_scaled[0], m_scaled[0], m_scaled[1], m_mask, job.row, job.blend};
+    scaledJob.BlendRows(0, geometry.height);
+    if (!m_scaled[0].TryResize(target, kBilinear)) {
+        throw std::bad_alloc();
+    }
+}
+
+} // namespace kyv
