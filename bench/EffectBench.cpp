@@ -78,6 +78,7 @@ const EffectCase kCases[] = {
     {"alpha transition", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}},
     {"alpha transition, 2 threads", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}, 0, {}, 2},
     {"test alpha transition", "DSP_TR_TestAlpha", {{"P1", 0.5F}}},
+    {"dreamy", "Kyv_Dsp_Vi_Dreamy", {{"P1", uint8_t{12}}}},
 };
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units

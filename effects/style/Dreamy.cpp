@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "effects/style/DreamyFilter.h"
 #include "effects/style/StyleCall.h"
 
 namespace kyv {
@@ -27,11 +28,17 @@ KyvStatus Dreamy::Process(EffectContext& context, Instance& instance) {
     if (RenderOnGpu(context, instance.gpu, geometry, instance.input, GpuEffect_Dreamy, settings)) {
         return KYV_OK;
     }
-    CopyView(geometry, context.frame, instance.input);
+    if (!instance.filter) {
+        instance.filter = new CDreamyFilter;
+    }
+    instance.filter->Render(MakeStyleFrame(context, geometry, instance.input), degree, mask,
+                            context.cpuLevel);
     return KYV_OK;
 }
 
 void Dreamy::Release(EffectContext& context, Instance& instance) {
+    delete instance.filter;
+    instance.filter = nullptr;
     HandBackGpu(context, instance.gpu);
 }
 

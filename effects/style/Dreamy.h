@@ -14,11 +14,13 @@
 
 namespace kyv {
 
+class CDreamyFilter;
+
 struct Dreamy {
     struct Instance {
         void* input;
         GpuBinding gpu;
-        void* reserved;
+        CDreamyFilter* filter; // made with the first frame on the processor
     };
     static_assert(sizeof(Instance) == 48);
 

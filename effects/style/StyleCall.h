@@ -1,9 +1,10 @@
-// What the callbacks of the style effects share: parameters as filters and GPU helpers may have
-// them.
+// What the callbacks of the style effects share: frames and parameters as filters and GPU helpers
+// may have them.
 #pragma once
 
 #include <cstdint>
 
+#include "effects/style/StyleFrame.h"
 #include "effects/style/StyleMask.h"
 #include "module/FrameGeometry.h"
 #include "module/GpuHelper.h"
@@ -11,6 +12,10 @@
 #include "module/ParamReader.h"
 
 namespace kyv {
+
+// The call's view of the input and of the context's frame.
+StyleFrame MakeStyleFrame(const EffectContext& context, const FrameGeometry& geometry,
+                          const void* input);
 
 // The four mask parameters, which lie one after the other: rectangle, shape, depth, inverse.
 // Normalised.

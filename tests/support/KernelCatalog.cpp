@@ -93,6 +93,7 @@ std::vector<KernelEntry> MakeCatalog() {
              }));
     AddImageOperations(list);
     AddParticles(list);
+    AddStyle(list);
     AddPip(list);
     AddTransitions(list);
     return list;

@@ -19,13 +19,15 @@ KernelEntry Blocks(const kyv::KernelTable<Function>& table, KernelEntry entry, B
     return entry;
 }
 
+inline constexpr size_t kMostSources = 10; // of a row loop
+
 // The same for row loops: bind(seed) gives a callable row(form, dst, sources, count), where sources
 // are the rows' first bytes.
 template <class Function, class Bind>
 KernelEntry Rows(const kyv::KernelTable<Function>& table, KernelEntry entry, Bind bind) {
     return Blocks(table, std::move(entry), [bind](uint32_t seed) {
         return [row = bind(seed)](Function form, const KernelBuffers& buffers) {
-            const uint8_t* sources[2] = {};
+            const uint8_t* sources[kMostSources] = {};
             for (int32_t y = 0; y < buffers.size.height; ++y) {
                 for (size_t i = 0; i < buffers.sources.size(); ++i) {
                     sources[i] = buffers.sources[i].pixels + y * buffers.sources[i].pitch;
@@ -54,6 +56,7 @@ inline constexpr auto kInPlaceOnly = [](uint32_t) {
 // The parts of the list that live in files of their own.
 void AddImageOperations(std::vector<KernelEntry>& list);
 void AddParticles(std::vector<KernelEntry>& list);
+void AddStyle(std::vector<KernelEntry>& list);
 void AddPip(std::vector<KernelEntry>& list);
 void AddTransitions(std::vector<KernelEntry>& list);
 

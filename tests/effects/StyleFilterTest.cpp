@@ -1,0 +1,287 @@
+// What the style filters promise, through the callbacks.
+#include <algorithm>
+#include <cstdlib>
+#include <functional>
+#include <limits>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "imageutility/ImageUtility.h"
+#include "tests/support/TestHost.h"
+
+namespace {
+
+using namespace kyvtest;
+
+struct Rect {
+    float left, top, right, bottom;
+};
+constexpr float kNan = std::numeric_limits<float>::quiet_NaN();
+constexpr float kInf = std::numeric_limits<float>::infinity();
+
+// A picture with edges, a bright disc and a gradient.
+Frame Scene(uint32_t width, uint32_t height) {
+    Frame frame(size_t{width} * height);
+    for (uint32_t y = 0; y < height; ++y) {
+        for (uint32_t x = 0; x < width; ++x) {
+            const int dx = static_cast<int>(3 * x) - static_cast<int>(width);
+            const int dy = static_cast<int>(3 * y) - static_cast<int>(height);
+            const uint32_t base = 20 + x * 60 / width + (y * 4 / height % 2) * 70;
+            const uint32_t pixel = dx * dx + dy * dy < static_cast<int>(height * height) / 4
+                                       ? 0xFFF0E0
+                                       : base << 16 | (base + 30) << 8 | base / 2;
+            frame[size_t{y} * width + x] = pixel | (x * 7 + y) << 24;
+        }
+    }
+    return frame;
+}
+
+using Prepare = std::function<void(CTestInstance&)>;
+
+Frame Render(const char* effect, const Frame& input, uint32_t width, const Prepare& prepare = {}) {
+    CTestInstance instance(Effect(effect), width, static_cast<uint32_t>(input.size()) / width);
+    instance.Context().cpuLevel = 5;
+    if (prepare) {
+        prepare(instance);
+    }
+    Frame result(input.size(), 0x5A5A5A5A);
+    EXPECT_EQ(instance.Begin(), KYV_OK);
+    EXPECT_EQ(instance.Render(result.data(), input.data()), KYV_OK);
+    return result;
+}
+
+class StyleFilter : public testing::TestWithParam<const char*> {
+protected:
+    Frame On(const Frame& input, uint32_t width, const Prepare& prepare = {}) const {
+        return Render(GetParam(), input, width, prepare);
+    }
+};
+
+INSTANTIATE_TEST_SUITE_P(All, StyleFilter, testing::Values("Kyv_Dsp_Vi_Dreamy"),
+                         [](const auto& entry) {
+                             const std::string name = entry.param;
+                             return name.substr(name.rfind('_') + 1);
+                         });
+
+TEST_P(StyleFilter, LevelsAndThreadsAgreeAtEverySize) {
+    for (const auto& [width, height] :
+         {std::pair{1U, 1U}, {1U, 9U}, {2U, 2U}, {9U, 1U}, {3U, 70U}, {67U, 41U}, {163U, 120U}}) {
+        for (const Frame& input : {Scene(width, height), RandomFrame(size_t{width} * height, 4)}) {
+            const auto at = [&](int32_t level, uint32_t threads) {
+                return On(input, width, [&](CTestInstance& instance) {
+                    instance.Context().cpuLevel = level;
+                    instance.Context().threadCount = threads;
+                });
+            };
+            const Frame scalar = at(0, 1);
+            for (const int32_t level : {1, 3, 4, 5}) {
+                EXPECT_EQ(at(level, 1), scalar) << width << " x " << height << " level " << level;
+            }
+            for (const uint32_t threads : {0U, 2U, 3U, 7U}) {
+                EXPECT_EQ(at(5, threads), scalar) << width << " x " << height << " on " << threads;
+            }
+            // Alpha is the source's.
+            for (size_t i = 0; i < input.size(); ++i) {
+                ASSERT_EQ(scalar[i] >> 24, input[i] >> 24) << i;
+            }
+        }
+    }
+}
+
+TEST_P(StyleFilter, FieldsMakeUpTheFrameAndLeaveTheOtherRowsAlone) {
+    constexpr uint32_t kWidth = 60, kHeight = 41;
+    const Frame input = Scene(kWidth, kHeight);
+    for (const uint32_t format : {PixelFormat_Argb, PixelFormat_Ayuv}) {
+        const auto whole = [&](uint32_t field) {
+            return On(input, kWidth, [&](CTestInstance& instance) {
+                instance.Context().pixelFormat = format;
+                instance.Context().fieldSelector = field;
+            });
+        };
+        const Frame frame = whole(0), first = whole(1), second = whole(2);
+        for (size_t i = 0; i < frame.size(); ++i) {
+            const bool even = i / kWidth % 2 == 0;
+            ASSERT_EQ(first[i], even ? frame[i] : 0x5A5A5A5A) << i;
+            ASSERT_EQ(second[i], even ? 0x5A5A5A5A : frame[i]) << i;
+        }
+    }
+}
+
+TEST_P(StyleFilter, AyuvFramesAndViewsGiveTheSamePicture) {
+    using namespace KYVImageUtility;
+    constexpr int32_t kWidth = 50, kHeight = 30;
+    Frame argb = Scene(kWidth, kHeight);
+    Frame ayuv(argb.size());
+    CImageARGB a(reinterpret_cast<uint8_t*>(argb.data()), kWidth, kHeight, kWidth * 4);
+    CImageAYUV v(reinterpret_cast<uint8_t*>(ayuv.data()), kWidth, kHeight, kWidth * 4);
+    a.ToAYUV(v);
+    v.ToARGB(a); // what the filter gets to see
+    Frame expected = On(argb, kWidth);
+    Frame converted(expected.size());
+    CImageARGB expectedView(reinterpret_cast<uint8_t*>(expected.data()), kWidth, kHeight,
+                            kWidth * 4);
+    CImageAYUV convertedView(reinterpret_cast<uint8_t*>(converted.data()), kWidth, kHeight,
+                             kWidth * 4);
+    expectedView.ToAYUV(convertedView);
+    const auto asAyuv = [](CTestInstance& instance) {
+        instance.Context().pixelFormat = PixelFormat_Ayuv;
+    };
+    EXPECT_EQ(On(ayuv, kWidth, asAyuv), converted);
+
+    // Two views side by side: each as if it were alone.
+    for (const uint32_t layout : {1U, 2U}) {
+        const size_t shift = layout == 2 ? kWidth : 0;
+        Frame input = RandomFrame(argb.size() * 2, 9);
+        for (int32_t y = 0; y < kHeight; ++y) {
+            std::copy_n(&argb[size_t{kWidth} * y], kWidth, &input[size_t{2 * kWidth} * y + shift]);
+        }
+        CTestInstance instance(Effect(GetParam()), kWidth, kHeight);
+        instance.Context().stereoLayout = layout;
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        Frame output(input.size(), 7);
+        ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+        for (int32_t y = 0; y < kHeight; ++y) {
+            for (int32_t x = 0; x < kWidth; ++x) {
+                const size_t row = size_t{2 * kWidth} * y;
+                ASSERT_EQ(output[row + shift + x], expected[size_t{kWidth} * y + x]) << x << y;
+                ASSERT_EQ(output[row + kWidth - shift + x], 7U) << x << ", " << y;
+            }
+        }
+    }
+}
+
+TEST_P(StyleFilter, WorksInPlaceAndDoesNotDependOnWhatCameBefore) {
+    constexpr uint32_t kWidth = 64, kHeight = 48;
+    const Frame input = Scene(kWidth, kHeight);
+    const Frame expected = On(input, kWidth);
+    CTestInstance instance(Effect(GetParam()), kWidth, kHeight);
+    ASSERT_EQ(instance.Begin(), KYV_OK);
+    const Frame other = RandomFrame(input.size(), 11);
+    Frame output(input.size());
+    ASSERT_EQ(instance.Render(output.data(), other.data()), KYV_OK);
+    Frame inPlace = input;
+    ASSERT_EQ(instance.Render(inPlace.data(), inPlace.data()), KYV_OK);
+    EXPECT_EQ(inPlace, expected);
+    // Another size, and back, in one preparation.
+    instance.Context().width = 17;
+    instance.Context().height = 9;
+    ASSERT_EQ(instance.Render(output.data(), other.data()), KYV_OK);
+    instance.Context().width = kWidth;
+    instance.Context().height = kHeight;
+    ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+    EXPECT_EQ(output, expected);
+    EXPECT_NE(output, input);
+}
+
+// The mask is one piece of code for both.
+struct Masked {
+    const char* effect;
+    const char* rect;
+    const char* shape;
+    const char* depth;
+    const char* inverse;
+};
+
+class StyleMask : public testing::TestWithParam<Masked> {
+protected:
+    Frame Mask(const Rect& rect, int32_t shape, float depth, uint32_t inverse) const {
+        return Render(GetParam().effect, m_input, kWidth, [&](CTestInstance& instance) {
+            instance.Set(GetParam().rect, rect);
+            instance.Set(GetParam().shape, shape);
+            instance.Set(GetParam().depth, depth);
+            instance.Set(GetParam().inverse, inverse);
+        });
+    }
+
+    static constexpr uint32_t kWidth = 80, kHeight = 60;
+    Frame m_input = Scene(kWidth, kHeight);
+    Frame m_whole = Render(GetParam().effect, m_input, kWidth);
+};
+
+INSTANTIATE_TEST_SUITE_P(All, StyleMask,
+                         testing::Values(Masked{"Kyv_Dsp_Vi_Dreamy", "P2", "P3", "P4", "P5"}),
+                         [](const auto& entry) {
+                             return std::string(entry.param.effect).substr(8, 6);
+                         });
+
+TEST_P(StyleMask, SharpBoxTreatsItsPixelsAndTheInverseAllOthers) {
+    // 0.25 and 0.75 of 80 are 20 and 60, 0.5 and 1 of 60 are 30 and 60.
+    const Frame box = Mask({0.25F, 0.5F, 0.75F, 1.0F}, 0, 0.0F, 0);
+    const Frame inverse = Mask({0.25F, 0.5F, 0.75F, 1.0F}, 0, 0.0F, 1);
+    for (uint32_t y = 0; y < kHeight; ++y) {
+        for (uint32_t x = 0; x < kWidth; ++x) {
+            const size_t i = size_t{y} * kWidth + x;
+            const bool inside = x >= 20 && x < 60 && y >= 30;
+            ASSERT_EQ(box[i], (inside ? m_whole : m_input)[i]) << x << ", " << y;
+            ASSERT_EQ(inverse[i], (inside ? m_input : m_whole)[i]) << x << ", " << y;
+        }
+    }
+    EXPECT_EQ(Mask({0.75F, 1.0F, 0.25F, 0.5F}, 0, 0.0F, 0), box) << "inverted";
+    EXPECT_EQ(Mask({0.25F, 0.5F, 0.75F, 9.0F}, 7, -1.0F, 0), box) << "beyond the frame";
+}
+
+TEST_P(StyleMask, WholeFrameAndNothing) {
+    EXPECT_EQ(Mask({0, 0, 0, 0}, 1, 0.4F, 0), m_whole);
+    EXPECT_EQ(Mask({kNan, kNan, kNan, kNan}, 1, kNan, 0), m_whole);
+    EXPECT_EQ(Mask({0, 0, 0, 0}, 0, 0.1F, 1), m_input);
+    EXPECT_EQ(Mask({2, 2, 3, 3}, 0, 0, 0), m_input);
+    EXPECT_EQ(Mask({2, 2, 3, 3}, 1, 0, 1), m_whole);
+    EXPECT_EQ(Mask({0.5F, 0.5F, 0.5F, 0.9F}, 0, 0, 0), m_input) << "empty";
+    EXPECT_EQ(Mask({-kInf, -kInf, kInf, kInf}, 0, kInf, 0), m_whole);
+}
+
+TEST_P(StyleMask, EllipseLeavesTheCornersAndTheRimIsSoft) {
+    const Frame ellipse = Mask({0.0F, 0.0F, 1.0F, 1.0F}, 1, 0.0F, 0);
+    const auto at = [&](uint32_t x, uint32_t y) { return size_t{y} * kWidth + x; };
+    for (const auto& [x, y] : {std::pair{0U, 0U}, {79U, 0U}, {0U, 59U}, {79U, 59U}, {8U, 6U}}) {
+        EXPECT_EQ(ellipse[at(x, y)], m_input[at(x, y)]);
+    }
+    for (const auto& [x, y] : {std::pair{40U, 30U}, {40U, 1U}, {1U, 30U}, {78U, 30U}, {15U, 12U}}) {
+        EXPECT_EQ(ellipse[at(x, y)], m_whole[at(x, y)]);
+    }
+    // Between the source at the border and the effect in the middle lies neither's step: along the
+    // rim the result's distance from the source never falls.
+    const Frame soft = Mask({0.0F, 0.0F, 1.0F, 1.0F}, 0, 0.4F, 0);
+    int between = 0;
+    for (uint32_t x = 0; x < kWidth; ++x) {
+        for (int c = 0; c < 24; c += 8) {
+            const int s = m_input[at(x, 30)] >> c & 255, e = m_whole[at(x, 30)] >> c & 255,
+                      r = soft[at(x, 30)] >> c & 255;
+            EXPECT_GE(r, std::min(s, e));
+            EXPECT_LE(r, std::max(s, e));
+            between += r != s && r != e;
+        }
+    }
+    EXPECT_GT(between, 10);
+    EXPECT_EQ(soft[at(40, 30)], m_whole[at(40, 30)]);
+}
+
+TEST(Dreamy, FlatAreasKeepTheirPlaceAndLightsBloomIntoTheirSurroundings) {
+    constexpr uint32_t kSize = 120;
+    Frame input(kSize * kSize, 0xFF000000);
+    EXPECT_EQ(Render("Kyv_Dsp_Vi_Dreamy", input, kSize), input) << "black stays";
+    const Frame white(input.size(), 0xFFFFFFFF);
+    EXPECT_EQ(Render("Kyv_Dsp_Vi_Dreamy", white, kSize), white) << "white stays";
+
+    for (uint32_t y = 50; y < 70; ++y) {
+        std::fill_n(&input[y * kSize + 50], 20, 0xFFFFFFFF);
+    }
+    const auto green = [&](uint8_t degree, uint32_t x) {
+        return Render(
+                   "Kyv_Dsp_Vi_Dreamy", input, kSize,
+                   [&](CTestInstance& instance) { instance.Set("P1", degree); })[60 * kSize + x] >>
+                   8 &
+               255;
+    };
+    // The bloom falls off with the distance and grows with the degree; the light does not dim.
+    EXPECT_GT(green(40, 72), green(40, 76));
+    EXPECT_GT(green(40, 76), green(40, 80));
+    EXPECT_GT(green(40, 76), green(5, 76));
+    EXPECT_EQ(green(5, 110), 0U);
+    EXPECT_GE(green(40, 60), 250U);
+    EXPECT_EQ(green(0, 72), green(1, 72)) << "degrees are kept within 1 to 40";
+    EXPECT_EQ(green(255, 72), green(40, 72));
+}
+
+} // namespace

@@ -1,0 +1,95 @@
+// The catalogue's entries of the style effects.
+#include <cstring>
+#include <random>
+#include <vector>
+
+#include "effects/style/DreamyRow.h"
+#include "effects/style/HighlightRow.h"
+#include "effects/style/MaskMixRow.h"
+#include "effects/style/ShrinkRow.h"
+#include "tests/support/KernelRows.h"
+
+namespace kyvtest {
+namespace {
+
+// Sums of rows lie in memory as words, aligned as they are.
+std::vector<uint16_t> WordsOf(const uint8_t* bytes, size_t count, uint16_t limit) {
+    std::vector<uint16_t> words(count);
+    std::memcpy(words.data(), bytes, count * 2);
+    for (uint16_t& word : words) {
+        word = static_cast<uint16_t>(word % (limit + 1U));
+    }
+    return words;
+}
+
+auto BindAdd(uint32_t) {
+    return [](kyv::AddRow form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        std::vector<uint16_t> sums = WordsOf(dst, count, 65280 - 255);
+        form(sums.data(), src[0], count);
+        std::memcpy(dst, sums.data(), count * 2);
+    };
+}
+
+auto BindAverage(uint32_t seed) {
+    const auto bits = static_cast<int32_t>(seed % (kyv::kMostShrinkBits + 1));
+    return [bits](kyv::AverageRow form, const KernelBuffers& buffers) {
+        const auto count = static_cast<size_t>(buffers.size.width);
+        const auto limit = static_cast<uint16_t>(255 << bits);
+        for (int32_t y = 0; y < buffers.size.height; ++y) {
+            const auto sums = WordsOf(buffers.sources[0].pixels + y * buffers.sources[0].pitch,
+                                      count << bits << 2, limit);
+            form(buffers.dst + y * buffers.dstPitch, sums.data(), count, bits);
+        }
+    };
+}
+
+auto BindHighlight(uint32_t seed) {
+    std::mt19937 random(seed);
+    const kyv::Highlight highlight = {static_cast<uint8_t>(random() % 255),
+                                      static_cast<uint16_t>(1 + random() % 256)};
+    return [highlight](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        form(dst, src[0], count, highlight);
+    };
+}
+
+auto BindDreamy(uint32_t seed) {
+    std::mt19937 random(seed);
+    const kyv::DreamyMix mix = seed % 4 == 0
+                                   ? kyv::DreamyMix{256, 256, 256}
+                                   : kyv::DreamyMix{static_cast<uint16_t>(random() % 257),
+                                                    static_cast<uint16_t>(random() % 257),
+                                                    static_cast<uint16_t>(random() % 257)};
+    return [mix](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        form(dst, src[0], src[1], src[2], count, mix);
+    };
+}
+
+} // namespace
+
+void AddStyle(std::vector<KernelEntry>& list) {
+    list.push_back(Rows(kyv::kAddRow,
+                        {.table = "kAddRow", .dstBytes = 2, .readsDst = true, .sourceBytes = {1}},
+                        BindAdd));
+    list.push_back(Blocks(kyv::kAverageRow,
+                          {.table = "kAverageRow",
+                           .sourceBytes = {8},
+                           .sourceSize =
+                               [](Size dst, uint32_t) {
+                                   return Size{dst.width << kyv::kMostShrinkBits, dst.height};
+                               }},
+                          BindAverage));
+    list.push_back(Rows(kyv::kHighlightRow,
+                        {.table = "kHighlightRow", .inPlace = true, .inputBits = {24}},
+                        BindHighlight));
+    list.push_back(Rows(kyv::kDreamyRow,
+                        {.table = "kDreamyRow", .inPlace = true, .sourceBytes = {4, 4, 4}},
+                        BindDreamy));
+    list.push_back(Rows(kyv::kMaskMixRow,
+                        {.table = "kMaskMixRow", .inPlace = true, .sourceBytes = {4, 4, 1}},
+                        [](uint32_t) {
+                            return [](auto form, uint8_t* dst, const uint8_t* const* src,
+                                      size_t count) { form(dst, src[0], src[1], src[2], count); };
+                        }));
+}
+
+} // namespace kyvtest
