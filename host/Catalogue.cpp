@@ -16,20 +16,27 @@ namespace {
 using json = nlohmann::ordered_json;
 using Row = std::vector<std::string>;
 
+// Of UTF-8 text: every byte but those that continue a letter.
+size_t LetterCount(const std::string& text) {
+    return static_cast<size_t>(std::count_if(text.begin(), text.end(), [](char unit) {
+        return (static_cast<unsigned char>(unit) & 0xC0) != 0x80;
+    }));
+}
+
 // Columns as wide as their widest cell, two blanks between.
 std::string TableText(const std::vector<Row>& rows) {
     std::vector<size_t> widths;
     for (const Row& row : rows) {
         widths.resize(std::max(widths.size(), row.size()));
         for (size_t i = 0; i < row.size(); ++i) {
-            widths[i] = std::max(widths[i], row[i].size());
+            widths[i] = std::max(widths[i], LetterCount(row[i]));
         }
     }
     std::string text;
     for (const Row& row : rows) {
         std::string line;
         for (size_t i = 0; i < row.size(); ++i) {
-            line += row[i] + std::string(widths[i] - row[i].size() + 2, ' ');
+            line += row[i] + std::string(widths[i] - LetterCount(row[i]) + 2, ' ');
         }
         text += line.substr(0, line.find_last_not_of(' ') + 1) + '\n';
     }
@@ -44,11 +51,18 @@ std::string Inputs(const EffectDescriptor& effect) {
     return std::to_string(effect.properties.inputCount);
 }
 
+std::string Category(const EffectDescriptor& effect) {
+    const std::string text = LanguageText(effect, effect.subclass);
+    return text.empty() ? Text(effect.subclass) : text;
+}
+
 json EffectJson(const EffectDescriptor& effect) {
     return {{"identifier", effect.identifier},
             {"name", EffectName(effect)},
             {"shortName", ShortName(effect)},
+            {"description", LanguageText(effect, effect.descKey)},
             {"subclass", Text(effect.subclass)},
+            {"category", Category(effect)},
             {"author", Text(effect.author)},
             {"vendor", Text(effect.vendor)},
             {"inputs", effect.properties.inputCount},
@@ -67,9 +81,10 @@ json ValueJson(const ParamDescriptor& param, const void* value) {
     return FormatValue(param, value);
 }
 
-json ParamJson(const ParamDescriptor& param, const void* value) {
+json ParamJson(const EffectDescriptor& effect, const ParamDescriptor& param, const void* value) {
     json entry = {{"key", param.key},
-                  {"name", ParamName(param)},
+                  {"name", ParamName(effect, param)},
+                  {"description", LanguageText(effect, param.descKey)},
                   {"type", TypeName(param)},
                   {"default", ValueJson(param, value)}};
     const std::vector<std::string> labels = ChoiceLabels(param);
@@ -107,9 +122,11 @@ std::string ListJson(const ModuleDescriptor& module) {
 
 std::string InfoText(const EffectDescriptor& effect) {
     const CInstance instance(effect);
+    const std::string description = LanguageText(effect, effect.descKey);
     std::string text = EffectName(effect) + " (" + ShortName(effect) + ")\n" +
+                       (description.empty() ? "" : description + ".\n") +
                        TableText({{"  identifier", effect.identifier},
-                                  {"  category", Text(effect.subclass)},
+                                  {"  category", Category(effect)},
                                   {"  author", Text(effect.author)},
                                   {"  vendor", Text(effect.vendor)},
                                   {"  inputs", Inputs(effect)}}) +
@@ -117,7 +134,7 @@ std::string InfoText(const EffectDescriptor& effect) {
     std::vector<Row> rows = {{"KEY", "NAME", "TYPE", "DEFAULT", "RANGE"}};
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
         const ParamDescriptor& param = effect.params[i];
-        rows.push_back({param.key, ParamName(param), TypeName(param),
+        rows.push_back({param.key, ParamName(effect, param), TypeName(param),
                         FormatValue(param, instance.Value(i)), RangeText(param)});
     }
     return text + TableText(rows);
@@ -128,7 +145,7 @@ std::string InfoJson(const EffectDescriptor& effect) {
     json entry = EffectJson(effect);
     entry["parameters"] = json::array();
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
-        entry["parameters"].push_back(ParamJson(effect.params[i], instance.Value(i)));
+        entry["parameters"].push_back(ParamJson(effect, effect.params[i], instance.Value(i)));
     }
     return entry.dump(2) + '\n';
 }

@@ -30,16 +30,19 @@ struct Scene {
     const char* identifier;
     double seconds;
     std::vector<std::string> sets;
+    const char* note = nullptr; // in place of the settings
 };
 
 const Scene kScenes[] = {
     {"Kyv_Dsp_Pfx_RefractiveBubble", 9, {"P3=1"}},
-    {"Kyv_Dsp_Pfx_WaterRipple", 9, {"P1=0.8"}},
+    {"Kyv_Dsp_Pfx_WaterRipple", 6, {"P1=0.5"}},
     {"Kyv_Dsp_Pfx_Bubble", 9, {"P3=1"}},
-    {"Kyv_Dsp_Pfx_Fireworks", 9, {"P2=0.8"}},
+    {"Kyv_Dsp_Pfx_Fireworks", 4, {"P1=0.9", "P2=1"}},
     {"Kyv_Dsp_Pi_Freeform",
      0,
-     {"P0=0.12", "P1=0.2", "P2=0.66", "P3=0.1", "P4=0.72", "P5=0.82", "P6=0.2", "P7=0.7"}},
+     {"P0=0.12", "P1=0.2", "P2=0.66", "P3=0.1", "P4=0.72", "P5=0.82", "P6=0.2", "P7=0.7",
+      "P16=#101018", "P17=#101018", "P19=150", "P20=6", "P25=#FFF4D6", "P26=#C98A3C"},
+     "four free corners, border and shadow"},
     {"DSP_TR_TestAlpha", 0, {"P1=0.5"}},
     {"DSP_TR_AlphaTransition", 0, {"P1=0.5", "P4=on"}},
     {"Kyv_Dsp_Vi_Dreamy", 0, {"P1=20"}},
@@ -103,10 +106,15 @@ Tile RenderTile(const EffectDescriptor& effect, const EffectSettings& settings,
     if (scene.seconds > 0) {
         notes.push_back("at " + std::to_string(std::lround(scene.seconds)) + " s");
     }
-    for (const std::string& assignment : scene.sets) {
-        const size_t equals = assignment.find('=');
-        const uint32_t index = FindParam(effect, assignment.substr(0, equals));
-        notes.push_back(ParamName(effect.params[index]) + " " + assignment.substr(equals + 1));
+    if (scene.note) {
+        notes.emplace_back(scene.note);
+    } else {
+        for (const std::string& assignment : scene.sets) {
+            const size_t equals = assignment.find('=');
+            const uint32_t index = FindParam(effect, assignment.substr(0, equals));
+            notes.push_back(ParamName(effect, effect.params[index]) + " " +
+                            assignment.substr(equals + 1));
+        }
     }
     return {std::move(result), EffectName(effect),
             notes.empty() ? "as a new instance has it" : Join(notes, ", ")};

@@ -7,6 +7,8 @@
 #include "host/ExitStatus.h"
 #include "host/Suggest.h"
 #include "host/Text.h"
+#include "module/LanguageLibrary.h"
+#include "platform/Library.h"
 
 namespace kyvhost {
 namespace {
@@ -66,6 +68,19 @@ std::string BareEffectName(const EffectDescriptor& effect) {
     return words;
 }
 
+// That with what keys leave out because the family says it.
+std::string NameOfKey(const EffectDescriptor& effect) {
+    const std::string bare = BareEffectName(effect);
+    const std::string_view family = FamilyTag(effect.nameKey);
+    if (family == "Co" && bare.find(' ') == std::string::npos) {
+        return "Color " + Lower(bare);
+    }
+    if (family == "Tr" && bare.find("transition") == std::string::npos) {
+        return bare + " transition";
+    }
+    return family == "Pi" ? bare + " picture-in-picture" : bare;
+}
+
 } // namespace
 
 std::string WordsOfKey(std::string_view key) {
@@ -97,27 +112,30 @@ std::string WordsOfKey(std::string_view key) {
     return words;
 }
 
-std::string ParamName(const ParamDescriptor& param) {
-    return WordsOfKey(param.nameKey);
+std::string LanguageText(const EffectDescriptor& effect, const char* key) {
+    const KyvModuleHandle library = effect.module ? effect.module->ResourceLibrary : nullptr;
+    if (!library || !key) {
+        return {};
+    }
+    const auto find =
+        reinterpret_cast<KyvLanguageTextFunction>(kyv::FindSymbol(library, KYV_LANGUAGE_TEXT_NAME));
+    const char* const text = find ? find(key) : nullptr;
+    return text ? text : "";
+}
+
+std::string ParamName(const EffectDescriptor& effect, const ParamDescriptor& param) {
+    const std::string text =
+        LanguageText(effect, std::string(WithoutLabels(param.nameKey)).c_str());
+    return text.empty() ? WordsOfKey(param.nameKey) : text;
 }
 
 std::string EffectName(const EffectDescriptor& effect) {
-    // Keys shorten what the family says; outside its family's menu the name needs it back.
-    const std::string bare = BareEffectName(effect);
-    const std::string_view family = FamilyTag(effect.nameKey);
-    std::string name = bare;
-    if (family == "Co" && bare.find(' ') == std::string::npos) {
-        name = "Color " + Lower(bare);
-    } else if (family == "Tr" && bare.find("transition") == std::string::npos) {
-        name = bare + " transition";
-    } else if (family == "Pi") {
-        name = bare + " picture-in-picture";
-    }
-    return name;
+    const std::string text = LanguageText(effect, effect.nameKey);
+    return text.empty() ? NameOfKey(effect) : text;
 }
 
 std::string ShortName(const EffectDescriptor& effect) {
-    std::string name = Lower(EffectName(effect));
+    std::string name = Lower(NameOfKey(effect));
     std::replace(name.begin(), name.end(), ' ', '-');
     return name;
 }
@@ -156,14 +174,14 @@ const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_v
     const EffectDescriptor* found = nullptr;
     for (uint32_t i = 0; i < module.effectCount; ++i) {
         const EffectDescriptor& effect = module.effects[i];
-        for (const std::string& name :
-             {ShortName(effect), Lower(BareEffectName(effect)), std::string(effect.identifier)}) {
+        for (const std::string& name : {ShortName(effect), Lower(BareEffectName(effect)),
+                                        std::string(effect.identifier), EffectName(effect)}) {
             if (Normalized(name) == Normalized(text)) {
                 return effect;
             }
             names.push_back(name);
         }
-        if (IsPart(text, ShortName(effect))) {
+        if (IsPart(text, ShortName(effect)) || IsPart(text, EffectName(effect))) {
             found = &effect;
             parts.push_back(ShortName(effect));
         }
@@ -191,17 +209,18 @@ uint32_t FindParam(const EffectDescriptor& effect, std::string_view text) {
     std::vector<std::string> names;
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
         const ParamDescriptor& param = effect.params[i];
-        const std::string name = ParamName(param);
+        const std::string name = ParamName(effect, param), words = WordsOfKey(param.nameKey);
         if (Normalized(param.key) == Normalized(text)) {
             return i;
         }
-        if (Normalized(name) == Normalized(text)) {
+        if (Normalized(name) == Normalized(text) || Normalized(words) == Normalized(text)) {
             whole.Add(i, param.key);
-        } else if (IsPart(text, name)) {
+        } else if (IsPart(text, name) || IsPart(text, words)) {
             parts.Add(i, param.key);
         }
         names.emplace_back(param.key);
         names.push_back(Lower(name));
+        names.push_back(Lower(words));
     }
     for (const Candidates& candidates : {whole, parts}) {
         if (candidates.keys.size() == 1) {

@@ -1,7 +1,9 @@
 // Effects and parameters by the names that people use.
 //
-// The records hold string-table keys, and names are read off them: the words of
-// "IDS_Vi_Param_BubbleMinSize_Name" are "Bubble min size".
+// The records hold keys. What people read comes from the language library that the module has
+// loaded; where that has no text, or there is no library, a name is read off the key: the words of
+// "IDS_Vi_Param_BubbleMinSize_Name" are "Bubble min size". Short names and the words of keys are
+// the same in every language, and what people write may be either.
 #pragma once
 
 #include <cstdint>
@@ -13,11 +15,14 @@
 
 namespace kyvhost {
 
+// The text of a key in the module's language library; empty when there is none.
+std::string LanguageText(const EffectDescriptor& effect, const char* key);
+
 // The words of a key, without its prefix, tags, ending and choice labels.
 std::string WordsOfKey(std::string_view key);
 
-// "Bubble min size"
-std::string ParamName(const ParamDescriptor& param);
+// "Minimum size"
+std::string ParamName(const EffectDescriptor& effect, const ParamDescriptor& param);
 
 // "Color temperature"
 std::string EffectName(const EffectDescriptor& effect);

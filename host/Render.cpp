@@ -317,7 +317,7 @@ VideoFormat CRendering::Format(const Rational& rate, int64_t frames) const {
 void CRendering::RunTransition() {
     for (uint32_t i = 0; i < m_effect.paramCount && m_effect.properties.isTransition; ++i) {
         const ParamDescriptor& param = m_effect.params[i];
-        if (ParamName(param) == "Percentage" && !m_instance.IsGiven(i)) {
+        if (WordsOfKey(param.nameKey) == "Percentage" && !m_instance.IsGiven(i)) {
             m_instance.Animate(std::string(param.key) + "=0:1", m_options.easing);
         }
     }

@@ -31,9 +31,13 @@ size_t EditDistance(std::string_view a, std::string_view b) {
 std::string Nearest(std::string_view text, const std::vector<std::string>& candidates) {
     const std::string wanted = Normalized(text);
     std::string nearest;
-    size_t best = static_cast<size_t>(-1);
+    double best = 2;
     for (const std::string& candidate : candidates) {
-        const size_t distance = EditDistance(wanted, Normalized(candidate));
+        // Against the length, or short keys would be near to everything.
+        const std::string name = Normalized(candidate);
+        const size_t length = std::max({wanted.size(), name.size(), size_t{1}});
+        const double distance =
+            static_cast<double>(EditDistance(wanted, name)) / static_cast<double>(length);
         if (distance < best) {
             best = distance;
             nearest = candidate;

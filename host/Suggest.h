@@ -10,7 +10,8 @@ namespace kyvhost {
 // The number of letters to insert, delete, change or swap with their neighbour.
 size_t EditDistance(std::string_view a, std::string_view b);
 
-// The candidate nearest to text by Normalized form, the first of several; empty for no candidates.
+// The candidate with the least share of letters to change to make it text, both Normalized; the
+// first of several, empty for no candidates.
 std::string Nearest(std::string_view text, const std::vector<std::string>& candidates);
 
 } // namespace kyvhost

@@ -60,9 +60,10 @@ size_t FloatCount(const ParamDescriptor& param) {
     return param.type == ParamType_MaskRect ? 4 : param.type == ParamType_Position ? 2 : 0;
 }
 
-// A switch of four bytes may have a further mode, such as the comparison's side by side.
+// The comparison is declared as a switch and has a further mode, side by side.
 bool HasThirdMode(const ParamDescriptor& param) {
-    return param.type == ParamType_Bool && param.valueSize == 4;
+    return param.type == ParamType_Bool && param.valueSize == 4 &&
+           WordsOfKey(param.nameKey) == "Compare image";
 }
 
 std::string NumberText(const ParamDescriptor& param, double number) {
