@@ -83,6 +83,7 @@ public:
                         "the module's file; default: " KYV_MODULE_NAME " beside kyvhost")
             ->type_name("FILE");
         m_app.fallthrough();
+        m_app.allow_windows_style_options(false); // "/home/me/photo.png" is a file everywhere
         AddList();
         AddInfo();
         AddRender();
@@ -198,8 +199,10 @@ private:
         verb->add_option("OUTPUT", m_output, "a .png picture, or a .mp4, .m4v, .mov or .mkv video")
             ->required()
             ->type_name("");
-        AddText(verb, "--input2", "FILE", "the second input of a transition, or the inner picture",
-                [this](const std::string& text) { m_render.input2 = PathOf(text); });
+        AddText(
+            verb, "--input2", "FILE",
+            "the second input of a transition, or the inner picture; takes the first one's size",
+            [this](const std::string& text) { m_render.input2 = PathOf(text); });
         AddSettings(verb);
         AddLevel(verb);
         verb->add_option("--animate", m_render.animations,
