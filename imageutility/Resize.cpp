@@ -87,12 +87,9 @@ bool ResizeBilinear(const CImageARGB& source, const CImageARGB& destination) {
     for (int32_t y = 0; y < height; ++y) {
         const ResizeStep step = UnpackStep(scratch.rowSteps[y]);
         upper += static_cast<int32_t>(step.lower);
-        if (step.fraction == 0) {
-            std::memcpy(destination.Row(y), rows.Get(upper), count * 4);
-            continue;
-        }
         const uint8_t* first = rows.Get(upper);
-        lerp(destination.Row(y), first, rows.Get(upper + 1), count, step.fraction);
+        const uint8_t* second = step.fraction == 0 ? first : rows.Get(upper + 1);
+        lerp(destination.Row(y), first, second, count, step.fraction);
     }
     return true;
 }

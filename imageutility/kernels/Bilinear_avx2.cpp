@@ -88,20 +88,19 @@ void Bilinear_avx2(uint8_t* dst, const uint8_t* src, size_t count, const Bilinea
 
 void Lerp_avx2(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
                uint32_t fraction) {
-    // From a fraction of 1 on both weights fit in signed bytes.
+    // Weights up to 127 fit in signed bytes. A fraction of 0 takes both halves from the upper row.
+    const uint8_t* second = fraction == 0 ? upper : lower;
+    const uint32_t f = fraction == 0 ? 64 : fraction;
+    const __m256i weights = _mm256_set1_epi16(static_cast<short>((f << 8) | (128 - f)));
     size_t i = 0;
-    if (fraction != 0) {
-        const __m256i weights =
-            _mm256_set1_epi16(static_cast<short>((fraction << 8) | (128 - fraction)));
-        for (; i + 8 <= count; i += 8) {
-            const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(upper + i * 4));
-            const __m256i b = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(lower + i * 4));
-            const __m256i low = _mm256_maddubs_epi16(_mm256_unpacklo_epi8(a, b), weights);
-            const __m256i high = _mm256_maddubs_epi16(_mm256_unpackhi_epi8(a, b), weights);
-            _mm256_storeu_si256(
-                reinterpret_cast<__m256i*>(dst + i * 4),
-                _mm256_packus_epi16(_mm256_srli_epi16(low, 7), _mm256_srli_epi16(high, 7)));
-        }
+    for (; i + 8 <= count; i += 8) {
+        const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(upper + i * 4));
+        const __m256i b = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(second + i * 4));
+        const __m256i low = _mm256_maddubs_epi16(_mm256_unpacklo_epi8(a, b), weights);
+        const __m256i high = _mm256_maddubs_epi16(_mm256_unpackhi_epi8(a, b), weights);
+        _mm256_storeu_si256(
+            reinterpret_cast<__m256i*>(dst + i * 4),
+            _mm256_packus_epi16(_mm256_srli_epi16(low, 7), _mm256_srli_epi16(high, 7)));
     }
     Lerp_scalar(dst + i * 4, upper + i * 4, lower + i * 4, count - i, fraction);
 }

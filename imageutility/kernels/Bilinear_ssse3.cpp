@@ -40,19 +40,18 @@ void Bilinear_ssse3(uint8_t* dst, const uint8_t* src, size_t count,
 
 void Lerp_ssse3(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
                 uint32_t fraction) {
-    // From a fraction of 1 on both weights fit in signed bytes.
+    // Weights up to 127 fit in signed bytes. A fraction of 0 takes both halves from the upper row.
+    const uint8_t* second = fraction == 0 ? upper : lower;
+    const uint32_t f = fraction == 0 ? 64 : fraction;
+    const __m128i weights = _mm_set1_epi16(static_cast<short>((f << 8) | (128 - f)));
     size_t i = 0;
-    if (fraction != 0) {
-        const __m128i weights =
-            _mm_set1_epi16(static_cast<short>((fraction << 8) | (128 - fraction)));
-        for (; i + 4 <= count; i += 4) {
-            const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(upper + i * 4));
-            const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(lower + i * 4));
-            const __m128i low = _mm_maddubs_epi16(_mm_unpacklo_epi8(a, b), weights);
-            const __m128i high = _mm_maddubs_epi16(_mm_unpackhi_epi8(a, b), weights);
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + i * 4),
-                             _mm_packus_epi16(_mm_srli_epi16(low, 7), _mm_srli_epi16(high, 7)));
-        }
+    for (; i + 4 <= count; i += 4) {
+        const __m128i a = _mm_loadu_si128(reinterpret_cast<const __m128i*>(upper + i * 4));
+        const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i*>(second + i * 4));
+        const __m128i low = _mm_maddubs_epi16(_mm_unpacklo_epi8(a, b), weights);
+        const __m128i high = _mm_maddubs_epi16(_mm_unpackhi_epi8(a, b), weights);
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + i * 4),
+                         _mm_packus_epi16(_mm_srli_epi16(low, 7), _mm_srli_epi16(high, 7)));
     }
     Lerp_scalar(dst + i * 4, upper + i * 4, lower + i * 4, count - i, fraction);
 }
