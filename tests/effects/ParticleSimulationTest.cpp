@@ -362,7 +362,7 @@ TEST(FireworksSimulation, SeekingGivesTheStateOfPlaying) {
     for (const auto& [width, height] : {std::pair{1920, 1080}, {320, 240}, {5, 7}}) {
         FireworksRig played(width, height, 0.7F, 1.0F);
         FireworksRig sought(width, height, 0.7F, 1.0F);
-        ExpectSeekingEqualsPlaying(played.particles, sought.particles, 12000);
+        ExpectSeekingEqualsPlaying(played.particles, sought.particles, 8000);
     }
 }
 
