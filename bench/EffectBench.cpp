@@ -2,6 +2,7 @@
 #include "bench/Bench.h"
 
 #include <algorithm>
+#include <array>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -79,6 +80,8 @@ const EffectCase kCases[] = {
     {"alpha transition, 2 threads", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}, 0, {}, 2},
     {"test alpha transition", "DSP_TR_TestAlpha", {{"P1", 0.5F}}},
     {"dreamy", "Kyv_Dsp_Vi_Dreamy", {{"P1", uint8_t{12}}}},
+    {"light ray", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}},
+    {"light ray, 2 threads", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}, 0, {}, 2},
 };
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units

@@ -6,7 +6,6 @@
 #include "effects/style/DreamyRow.h"
 #include "effects/style/HighlightRow.h"
 #include "effects/style/MaskMixRow.h"
-#include "effects/style/ShrinkRow.h"
 
 namespace kyv {
 namespace {
@@ -24,29 +23,15 @@ float GlowSigma(float degree) {
     return 3.0F + 0.72F * degree;
 }
 
-// A blur this many small pixels wide shows nothing of the pixels' squares.
-constexpr float kLeastSigma = 2.0F;
-
-// The strongest reduction that a blur forgives. The least one bounds the work: a picture at most
-// this wide is blurred in a small part of the time that reading the frame takes.
-int32_t ChooseBits(int32_t width, float sigma, int32_t widest) {
-    int32_t bits = 0;
-    while (bits < kMostShrinkBits &&
-           ((width >> bits) > widest || sigma >= kLeastSigma * static_cast<float>(2 << bits))) {
-        ++bits;
-    }
-    return bits;
-}
-
 } // namespace
 
 void CDreamyFilter::Gather(const StyleFrame& frame) {
     const HighlightRow highlight = kHighlightRow.For(frame.set);
     for (int32_t y = 0; y < frame.height; ++y) {
         const uint8_t* row = frame.Load(y, m_source.data());
-        m_soft.TakeRow(row);
+        m_soft.TakeRow(y, row, m_softRows);
         highlight(m_result.data(), row, static_cast<size_t>(frame.width), kLights);
-        m_glow.TakeRow(m_result.data());
+        m_glow.TakeRow(y, m_result.data(), m_glowRows);
     }
 }
 
@@ -63,8 +48,12 @@ void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskS
     const float glowSigma = GlowSigma(amount) * scale;
     m_source.resize(static_cast<size_t>(frame.width) * 4);
     m_result.resize(static_cast<size_t>(frame.width) * 4);
-    m_soft.Prepare(frame.width, frame.height, ChooseBits(frame.width, softSigma, 960), cpuLevel);
-    m_glow.Prepare(frame.width, frame.height, ChooseBits(frame.width, glowSigma, 480), cpuLevel);
+    m_soft.Prepare(frame.width, frame.height, ChooseShrinkBits(frame.width, softSigma, 960),
+                   cpuLevel);
+    m_glow.Prepare(frame.width, frame.height, ChooseShrinkBits(frame.width, glowSigma, 480),
+                   cpuLevel);
+    m_soft.PrepareRows(m_softRows);
+    m_glow.PrepareRows(m_glowRows);
     Gather(frame);
     m_soft.Blur(softSigma);
     m_glow.Blur(glowSigma);
@@ -80,9 +69,11 @@ void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskS
         const uint8_t* source = frame.Load(y, m_source.data());
         uint8_t* target = frame.Target(y, m_result.data());
         if (m_mask.IsWhole()) {
-            dreamy(target, source, m_soft.Row(y), m_glow.Row(y), width, mix);
+            dreamy(target, source, m_soft.Row(y, m_softRows), m_glow.Row(y, m_glowRows), width,
+                   mix);
         } else {
-            dreamy(m_result.data(), source, m_soft.Row(y), m_glow.Row(y), width, mix);
+            dreamy(m_result.data(), source, m_soft.Row(y, m_softRows), m_glow.Row(y, m_glowRows),
+                   width, mix);
             kMaskMixRow.For(frame.set)(target, source, m_result.data(), m_mask.Row(y), width);
         }
         frame.Store(y, target);

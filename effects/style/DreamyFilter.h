@@ -26,6 +26,8 @@ private:
 
     CSmallPicture m_soft;
     CSmallPicture m_glow;
+    SmallPictureRows m_softRows;
+    SmallPictureRows m_glowRows;
     CStyleMask m_mask;
     std::vector<uint8_t> m_source; // rows of the frame's width
     std::vector<uint8_t> m_result;

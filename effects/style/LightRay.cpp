@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "effects/style/LightRayFilter.h"
 #include "effects/style/StyleCall.h"
 
 namespace kyv {
@@ -38,11 +39,17 @@ KyvStatus LightRay::Process(EffectContext& context, Instance& instance) {
                     settings)) {
         return KYV_OK;
     }
-    CopyView(geometry, context.frame, instance.input);
+    if (!instance.filter) {
+        instance.filter = new CLightRayFilter;
+    }
+    instance.filter->Render(MakeStyleFrame(context, geometry, instance.input), settings.degree,
+                            settings.x, settings.y, context.threadCount, context.cpuLevel);
     return KYV_OK;
 }
 
 void LightRay::Release(EffectContext& context, Instance& instance) {
+    delete instance.filter;
+    instance.filter = nullptr;
     HandBackGpu(context, instance.gpu);
 }
 

@@ -11,11 +11,14 @@
 
 namespace kyv {
 
+class CLightRayFilter;
+
 struct LightRay {
     struct Instance {
         void* input;
         GpuBinding gpu;
-        uint8_t reserved[424];
+        CLightRayFilter* filter; // made with the first frame on the processor
+        uint8_t reserved[416];
     };
     static_assert(sizeof(Instance) == 464);
 

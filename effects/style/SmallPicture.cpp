@@ -29,21 +29,29 @@ struct Place {
     int32_t fraction;
 };
 
+// A blur this many small pixels wide shows nothing of the pixels' squares.
+constexpr float kLeastSigma = 2.0F;
+
 } // namespace
+
+int32_t ChooseShrinkBits(int32_t width, float sigma, int32_t widest) {
+    int32_t bits = 0;
+    while (bits < kMostShrinkBits &&
+           ((width >> bits) > widest || sigma >= kLeastSigma * static_cast<float>(2 << bits))) {
+        ++bits;
+    }
+    return bits;
+}
 
 void CSmallPicture::Prepare(int32_t frameWidth, int32_t frameHeight, int32_t bits,
                             int32_t cpuLevel) {
     m_set = Resolve(cpuLevel);
-    m_taken = 0;
     if (frameWidth != m_frameWidth || frameHeight != m_frameHeight || bits != m_bits) {
         m_bits = -1; // should an allocation fail
         const int32_t width = Shrunk(frameWidth, bits);
         const int32_t height = Shrunk(frameHeight, bits);
         m_image.Create(width, height);
         m_other.Create(width, height);
-        m_sums.assign(static_cast<size_t>(width) << bits << 2, 0);
-        m_between.resize(static_cast<size_t>(width) * 4);
-        m_enlarged.resize(static_cast<size_t>(frameWidth) * 4);
         m_left.resize(static_cast<size_t>(frameWidth));
         m_weights.resize(static_cast<size_t>(frameWidth) * 2);
         for (int32_t x = 0; x < frameWidth; ++x) {
@@ -60,30 +68,32 @@ void CSmallPicture::Prepare(int32_t frameWidth, int32_t frameHeight, int32_t bit
     m_other.SetCpuLevel(cpuLevel);
 }
 
-void CSmallPicture::TakeRow(const uint8_t* row) {
+void CSmallPicture::PrepareRows(SmallPictureRows& rows) const {
+    const auto width = static_cast<size_t>(m_image.GetWidth());
+    rows.sums.resize(width << m_bits << 2);
+    rows.between.resize(width * 4);
+    rows.enlarged.resize(static_cast<size_t>(m_frameWidth) * 4);
+}
+
+void CSmallPicture::TakeRow(int32_t y, const uint8_t* row, SmallPictureRows& rows) {
     const size_t bytes = static_cast<size_t>(m_frameWidth) * 4;
     const int32_t side = 1 << m_bits;
     // The last row and the last column stand for those that are missing in the last squares.
-    const bool last = m_taken + 1 == m_frameHeight;
-    do {
-        if ((m_taken & (side - 1)) == 0) {
-            std::fill(m_sums.begin(), m_sums.end(), uint16_t{0});
+    const int32_t last = y + 1 == m_frameHeight ? (m_image.GetHeight() << m_bits) - 1 : y;
+    for (; y <= last; ++y) {
+        if ((y & (side - 1)) == 0) {
+            std::fill(rows.sums.begin(), rows.sums.end(), uint16_t{0});
         }
-        kAddRow.For(m_set)(m_sums.data(), row, bytes);
-        ++m_taken;
-        if ((m_taken & (side - 1)) == 0) {
-            Finish();
+        kAddRow.For(m_set)(rows.sums.data(), row, bytes);
+        if (((y + 1) & (side - 1)) == 0) {
+            uint16_t* edge = rows.sums.data() + bytes;
+            for (uint16_t* pixel = edge; pixel < rows.sums.data() + rows.sums.size(); pixel += 4) {
+                std::memcpy(pixel, edge - 4, 4 * sizeof *pixel);
+            }
+            kAverageRow.For(m_set)(m_image.Row(y >> m_bits), rows.sums.data(),
+                                   static_cast<size_t>(m_image.GetWidth()), m_bits);
         }
-    } while (last && (m_taken >> m_bits) < m_image.GetHeight());
-}
-
-void CSmallPicture::Finish() {
-    uint16_t* edge = m_sums.data() + static_cast<size_t>(m_frameWidth) * 4;
-    for (uint16_t* pixel = edge; pixel < m_sums.data() + m_sums.size(); pixel += 4) {
-        std::memcpy(pixel, edge - 4, 4 * sizeof *pixel);
     }
-    kAverageRow.For(m_set)(m_image.Row((m_taken >> m_bits) - 1), m_sums.data(),
-                           static_cast<size_t>(m_image.GetWidth()), m_bits);
 }
 
 void CSmallPicture::Blur(float sigma) {
@@ -107,17 +117,18 @@ void CSmallPicture::Blur(float sigma) {
     }
 }
 
-const uint8_t* CSmallPicture::Row(int32_t y) {
+const uint8_t* CSmallPicture::Row(int32_t y, SmallPictureRows& rows) const {
     if (m_bits == 0) {
         return m_image.Row(y);
     }
     const Place place(y, m_bits, m_image.GetHeight());
     const auto width = static_cast<size_t>(m_image.GetWidth());
-    kLerp.For(m_set)(m_between.data(), m_image.Row(place.lower), m_image.Row(place.lower + 1),
+    kLerp.For(m_set)(rows.between.data(), m_image.Row(place.lower), m_image.Row(place.lower + 1),
                      width, static_cast<uint32_t>(place.fraction));
-    kBilinear.For(m_set)(m_enlarged.data(), m_between.data(), static_cast<size_t>(m_frameWidth),
+    kBilinear.For(m_set)(rows.enlarged.data(), rows.between.data(),
+                         static_cast<size_t>(m_frameWidth),
                          {.left = m_left.data(), .weights = m_weights.data()});
-    return m_enlarged.data();
+    return rows.enlarged.data();
 }
 
 } // namespace kyv

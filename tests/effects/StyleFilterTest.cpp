@@ -58,7 +58,8 @@ protected:
     }
 };
 
-INSTANTIATE_TEST_SUITE_P(All, StyleFilter, testing::Values("Kyv_Dsp_Vi_Dreamy"),
+INSTANTIATE_TEST_SUITE_P(All, StyleFilter,
+                         testing::Values("Kyv_Dsp_Vi_Dreamy", "Kyv_Dsp_Vi_LightRay"),
                          [](const auto& entry) {
                              const std::string name = entry.param;
                              return name.substr(name.rfind('_') + 1);
@@ -282,6 +283,44 @@ TEST(Dreamy, FlatAreasKeepTheirPlaceAndLightsBloomIntoTheirSurroundings) {
     EXPECT_GE(green(40, 60), 250U);
     EXPECT_EQ(green(0, 72), green(1, 72)) << "degrees are kept within 1 to 40";
     EXPECT_EQ(green(255, 72), green(40, 72));
+}
+
+TEST(LightRay, StreamsAwayFromItsPlaceAndOnlyBrightens) {
+    constexpr uint32_t kWidth = 160, kHeight = 90;
+    Frame input(size_t{kWidth} * kHeight, 0xFF202020);
+    for (uint32_t y = 40; y < 50; ++y) {
+        std::fill_n(&input[size_t{y} * kWidth + 75], 10, 0xFFFFFFFF);
+    }
+    const auto render = [&](uint8_t degree, float x, float y) {
+        return Render("Kyv_Dsp_Vi_LightRay", input, kWidth, [&](CTestInstance& instance) {
+            instance.Set("P1", degree);
+            instance.Set("P2", std::pair{x, y});
+        });
+    };
+    EXPECT_EQ(render(0, 0.1F, 0.1F), input) << "degree 0 changes nothing";
+    EXPECT_EQ(render(200, -9.0F, 3.0F), render(30, -9.0F, 3.0F));
+    EXPECT_EQ(render(30, kNan, kNan), render(30, 0.0F, 0.0F));
+    EXPECT_EQ(render(30, kInf, -kInf), render(30, 16.0F, -16.0F));
+
+    // From the left the block's light falls to the right, from the right to the left.
+    const auto gain = [&](const Frame& frame, uint32_t x) {
+        return static_cast<int>(frame[size_t{45} * kWidth + x] & 255) - 0x20;
+    };
+    const Frame fromLeft = render(30, 0.0F, 0.5F);
+    EXPECT_GT(gain(fromLeft, 95), 10);
+    EXPECT_GT(gain(fromLeft, 95), gain(fromLeft, 130));
+    EXPECT_GT(gain(fromLeft, 130), 0);
+    EXPECT_EQ(gain(fromLeft, 55), 0);
+    EXPECT_GT(gain(render(5, 0.0F, 0.5F), 88), 0);
+    EXPECT_LT(gain(render(5, 0.0F, 0.5F), 95), gain(fromLeft, 95));
+    const Frame fromRight = render(30, 1.2F, 0.5F);
+    EXPECT_GT(gain(fromRight, 55), 10);
+    EXPECT_EQ(gain(fromRight, 110), 0);
+    for (size_t i = 0; i < input.size(); ++i) {
+        for (int c = 0; c < 24; c += 8) {
+            ASSERT_GE(fromLeft[i] >> c & 255, input[i] >> c & 255) << i;
+        }
+    }
 }
 
 } // namespace

@@ -6,6 +6,7 @@
 #include "effects/style/DreamyRow.h"
 #include "effects/style/HighlightRow.h"
 #include "effects/style/MaskMixRow.h"
+#include "effects/style/RayRow.h"
 #include "effects/style/ShrinkRow.h"
 #include "tests/support/KernelRows.h"
 
@@ -64,6 +65,44 @@ auto BindDreamy(uint32_t seed) {
     };
 }
 
+// Words of light in the buffers, which need not be aligned.
+std::vector<uint16_t> LightOf(const uint8_t* bytes, size_t count) {
+    return WordsOf(bytes, count, 65535);
+}
+
+auto BindRayLerp(uint32_t seed) {
+    const uint16_t fraction = seed % 4 == 0   ? 0
+                              : seed % 4 == 1 ? 65535
+                                              : std::mt19937(seed)() & 65535;
+    return [fraction](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        const auto upper = LightOf(src[0], count);
+        const auto lower = LightOf(src[1], count);
+        std::vector<uint16_t> result(count);
+        form(result.data(), upper.data(), lower.data(), count, fraction);
+        std::memcpy(dst, result.data(), count * 2);
+    };
+}
+
+auto BindRayStep(uint32_t seed) {
+    return [seed](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        const auto own = LightOf(src[0], count * 4);
+        auto row = LightOf(src[1], count * 4);
+        row.resize((count + 1) * 4, 65535); // there are always two neighbours
+        std::mt19937 random(seed);
+        std::vector<int32_t> left(count);
+        std::vector<uint16_t> fractions(count);
+        for (size_t i = 0; i < count; ++i) {
+            left[i] = static_cast<int32_t>(random() % count);
+            fractions[i] = static_cast<uint16_t>(random());
+        }
+        const auto brought = static_cast<uint16_t>(random());
+        std::vector<uint16_t> result(count * 4);
+        form(result.data(), own.data(), row.data(), count, {left.data(), fractions.data()},
+             {static_cast<uint16_t>(65535 - brought), brought});
+        std::memcpy(dst, result.data(), count * 8);
+    };
+}
+
 } // namespace
 
 void AddStyle(std::vector<KernelEntry>& list) {
@@ -89,6 +128,18 @@ void AddStyle(std::vector<KernelEntry>& list) {
                         [](uint32_t) {
                             return [](auto form, uint8_t* dst, const uint8_t* const* src,
                                       size_t count) { form(dst, src[0], src[1], src[2], count); };
+                        }));
+    list.push_back(Rows(kyv::kRayLerpRow,
+                        {.table = "kRayLerpRow", .dstBytes = 2, .sourceBytes = {2, 2}},
+                        BindRayLerp));
+    list.push_back(Rows(kyv::kRayStepRow,
+                        {.table = "kRayStepRow", .dstBytes = 8, .sourceBytes = {8, 8}},
+                        BindRayStep));
+    list.push_back(Rows(kyv::kRayAddRow,
+                        {.table = "kRayAddRow", .inPlace = true, .sourceBytes = {4, 4}},
+                        [](uint32_t) {
+                            return [](auto form, uint8_t* dst, const uint8_t* const* src,
+                                      size_t count) { form(dst, src[0], src[1], count); };
                         }));
 }
 
