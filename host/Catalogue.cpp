@@ -56,11 +56,30 @@ std::string Category(const EffectDescriptor& effect) {
     return text.empty() ? Text(effect.subclass) : text;
 }
 
+// An effect that has no sentence of its own repeats its name there.
+std::string Description(const EffectDescriptor& effect) {
+    const std::string text = LanguageText(effect, effect.descKey);
+    return text == EffectName(effect) ? "" : text;
+}
+
+// The range; for a choice the labels, which --set takes, each with its name where that says more.
+std::string Range(const EffectDescriptor& effect, const ParamDescriptor& param) {
+    std::vector<std::string> labels = ChoiceLabels(param);
+    if (param.type != ParamType_Choice || labels.empty()) {
+        return RangeText(param);
+    }
+    const std::vector<std::string> names = ChoiceNames(effect, param);
+    for (size_t i = 0; i < labels.size(); ++i) {
+        labels[i] += Normalized(labels[i]) == Normalized(names[i]) ? "" : " (" + names[i] + ")";
+    }
+    return "one of " + Join(labels, ", ");
+}
+
 json EffectJson(const EffectDescriptor& effect) {
     return {{"identifier", effect.identifier},
             {"name", EffectName(effect)},
             {"shortName", ShortName(effect)},
-            {"description", LanguageText(effect, effect.descKey)},
+            {"description", Description(effect)},
             {"subclass", Text(effect.subclass)},
             {"category", Category(effect)},
             {"author", Text(effect.author)},
@@ -90,6 +109,7 @@ json ParamJson(const EffectDescriptor& effect, const ParamDescriptor& param, con
     const std::vector<std::string> labels = ChoiceLabels(param);
     if (!labels.empty()) {
         entry["choices"] = labels;
+        entry["choiceNames"] = ChoiceNames(effect, param);
     } else if (HasRange(param)) {
         entry["minimum"] = ValueJson(param, param.minimum);
         entry["maximum"] = ValueJson(param, param.maximum);
@@ -122,7 +142,7 @@ std::string ListJson(const ModuleDescriptor& module) {
 
 std::string InfoText(const EffectDescriptor& effect) {
     const CInstance instance(effect);
-    const std::string description = LanguageText(effect, effect.descKey);
+    const std::string description = Description(effect);
     std::string text = EffectName(effect) + " (" + ShortName(effect) + ")\n" +
                        (description.empty() ? "" : description + ".\n") +
                        TableText({{"  identifier", effect.identifier},
@@ -135,7 +155,7 @@ std::string InfoText(const EffectDescriptor& effect) {
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
         const ParamDescriptor& param = effect.params[i];
         rows.push_back({param.key, ParamName(effect, param), TypeName(param),
-                        FormatValue(param, instance.Value(i)), RangeText(param)});
+                        FormatValue(param, instance.Value(i)), Range(effect, param)});
     }
     return text + TableText(rows);
 }

@@ -146,6 +146,18 @@ std::vector<std::string> ChoiceLabels(const ParamDescriptor& param) {
     return labels;
 }
 
+std::vector<std::string> ChoiceNames(const EffectDescriptor& effect, const ParamDescriptor& param) {
+    std::vector<std::string> names = ChoiceLabels(param);
+    for (std::string& name : names) {
+        std::string key(WithoutLabels(param.nameKey));
+        key += ';';
+        key += name;
+        std::string text = LanguageText(effect, key.c_str());
+        name = text.empty() ? name : text;
+    }
+    return names;
+}
+
 std::string Normalized(std::string_view text) {
     std::string normal;
     for (const char c : Lower(text)) {

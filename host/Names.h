@@ -33,6 +33,9 @@ std::string ShortName(const EffectDescriptor& effect);
 // The labels that follow the name key of a choice list.
 std::vector<std::string> ChoiceLabels(const ParamDescriptor& param);
 
+// "Top left" for "UL": one for each label, which is itself where the library has no text.
+std::vector<std::string> ChoiceNames(const EffectDescriptor& effect, const ParamDescriptor& param);
+
 // Letters and digits only, in lower case, "colour" as "color": what is equal after this is the
 // same name.
 std::string Normalized(std::string_view text);
