@@ -2,18 +2,30 @@
 #include <gmock/gmock.h>
 
 #include "tests/host/HostRun.h"
+#include "tests/support/TestHost.h"
 
 namespace kyvtest {
 namespace {
 
+namespace fs = std::filesystem;
 using testing::HasSubstr;
 
-HostResult RunIn(const std::string& locale, std::vector<std::string> arguments) {
-    arguments.insert(arguments.begin(), {"LC_ALL=" + locale, HostFile()});
-    return RunProgram("env", arguments);
-}
+// The module and two languages in a folder of their own: the search takes a dot in any folder's
+// name for the end of the module's, and the build may lie anywhere.
+class LanguageTest : public HostTest {
+protected:
+    LanguageTest() {
+        fs::copy_file(ModuleFile(), Path("plug.so"));
+        fs::copy_file(KYV_GERMAN_FILE, Path("plug_DEU.DLL"));
+        fs::copy_file(KYV_ENGLISH_FILE, Path("plug_ENU.DLL"));
+    }
 
-using LanguageTest = HostTest;
+    HostResult RunIn(const std::string& locale, std::vector<std::string> arguments) const {
+        arguments.insert(arguments.begin(),
+                         {"LC_ALL=" + locale, HostFile(), "--module", Path("plug.so")});
+        return RunProgram("env", arguments);
+    }
+};
 
 TEST_F(LanguageTest, NamesAreTranslatedAndCommandsAreNot) {
     const std::string german = RunIn("de_DE.UTF-8", {"info", "bubble"}).output;
