@@ -41,9 +41,6 @@ public:
     }
 
     const uint8_t* Next() override {
-        if (!m_current.empty()) {
-            m_free.Push(std::exchange(m_current, {}));
-        }
         std::optional<Frame> frame = m_filled.Pop();
         if (!frame) {
             Join();
@@ -52,7 +49,10 @@ public:
             }
             return nullptr;
         }
-        m_current = std::move(*frame);
+        m_current.swap(*frame);
+        if (!frame->empty()) {
+            m_free.Push(std::move(*frame));
+        }
         return m_current.data();
     }
 

@@ -27,7 +27,7 @@ class CFrameSource {
 public:
     virtual ~CFrameSource() = default;
 
-    // Null at the end. The frame stays valid until the next call. Throws CHostError.
+    // Null at the end. The frame stays valid until the next one is given. Throws CHostError.
     virtual const uint8_t* Next() = 0;
 };
 

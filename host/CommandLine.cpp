@@ -220,6 +220,10 @@ private:
             verb, "--duration", "TIME",
             "length of the clip; default: the shortest video's, or 10s for pictures",
             [this](const std::string& text) { m_render.duration = ParseTime("--duration", text); });
+        AddText(
+            verb, "--overlap", "TIME",
+            "play the first video, the effect for so long, then the rest of the second",
+            [this](const std::string& text) { m_render.overlap = ParseTime("--overlap", text); });
         AddText(verb, "--rate", "FPS", "frame rate; default: the video's, or 30 for pictures",
                 [this](const std::string& text) { m_render.rate = ParseRate("--rate", text); });
         AddText(verb, "--stereo", "sbs|split",

@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <cstring>
 
 #include "host/AyuvFrame.h"
 #include "host/Clip.h"
@@ -71,6 +72,13 @@ VideoCodec CodecFor(const RenderOptions& options) {
     return codec;
 }
 
+// Which frames of the result the effect makes; total 0: to the end, wherever that is.
+struct Timeline {
+    int64_t from = 0, count = 0; // of the effect
+    int64_t total = 0;
+    bool joined = false; // before from the first input shows, behind the effect the second
+};
+
 class CRendering {
 public:
     CRendering(const ModuleDescriptor& module, const RenderOptions& options)
@@ -106,8 +114,12 @@ private:
     void RunTransition();
     Rational ClipRate() const;
     int64_t ClipFrames(const Rational& rate) const;
+    Timeline JoinedTimeline(const Rational& rate) const;
+    int64_t RenderFrames(const Timeline& timeline, const Rational& rate, CFrameSink& sink,
+                         CProgress& progress);
     std::unique_ptr<CFrameSource> Frames(const Source& source, const Rational& rate) const;
     VideoFormat Format(const Rational& rate, int64_t frames) const;
+    SoundJoin JoinedSound(const Timeline& timeline, const Rational& rate) const;
 
     bool AllPictures() const {
         return std::all_of(m_sources.begin(), m_sources.end(),
@@ -127,10 +139,11 @@ private:
 
 void CRendering::CheckOutput() const {
     if (IsStillName(m_options.output)) {
-        if (m_options.codec || m_options.start || m_options.rate) {
+        if (m_options.codec || m_options.start || m_options.rate || m_options.overlap) {
             throw CUsageError(std::string(m_options.codec   ? "--codec"
                                           : m_options.start ? "--start"
-                                                            : "--rate") +
+                                          : m_options.rate  ? "--rate"
+                                                            : "--overlap") +
                               " is for videos, and " + TextOf(m_options.output) + " is a picture");
         }
     } else if (IsVideoName(m_options.output)) {
@@ -326,41 +339,73 @@ void CRendering::RunTransition() {
 void CRendering::RenderClip(const fs::path& file) {
     RunTransition();
     const Rational rate = ClipRate();
-    const int64_t total = ClipFrames(rate);
-    if (total == 0 && m_instance.IsAnimated()) {
+    Timeline timeline;
+    if (m_options.overlap) {
+        timeline = JoinedTimeline(rate);
+    } else {
+        timeline.total = timeline.count = ClipFrames(rate);
+    }
+    if (timeline.count == 0 && m_instance.IsAnimated()) {
         throw CUsageError(TextOf(m_sources.front().file) +
                           " does not tell its length; animations need --duration");
     }
-    const VideoFormat format = Format(rate, total);
+    VideoFormat format = Format(rate, timeline.total);
+    if (timeline.joined) {
+        format.join = JoinedSound(timeline, rate);
+        format.audioCodecs.clear();
+    }
     const std::vector<std::string> recoded = RecodedAudio(m_options.output, format.audioCodecs);
     if (!recoded.empty() && !m_options.quiet) {
         std::fprintf(stderr, "kyvhost: note: the sound becomes AAC; %s cannot hold %s\n",
                      TextOf(m_options.output.extension()).c_str(), Join(recoded, ", ").c_str());
     }
+    CFrameSink sink(std::make_unique<CVideoWriter>(m_options.tools, file, format), m_shape.Bytes(),
+                    m_options.settings.ayuv);
+    m_instance.Context().duration = PositionOfFrame(timeline.count, rate);
+    m_instance.Begin(m_shape);
+    CProgress progress(timeline.total, m_options.quiet);
+    const int64_t frames = RenderFrames(timeline, rate, sink, progress);
+    sink.Finish();
+    progress.Finish(frames);
+}
 
+// The number of frames rendered.
+int64_t CRendering::RenderFrames(const Timeline& timeline, const Rational& rate, CFrameSink& sink,
+                                 CProgress& progress) {
     std::vector<std::unique_ptr<CFrameSource>> sources;
     for (const Source& source : m_sources) {
         sources.push_back(Frames(source, rate));
     }
-    CFrameSink sink(std::make_unique<CVideoWriter>(m_options.tools, file, format), m_shape.Bytes(),
-                    m_options.settings.ayuv);
-    m_instance.Context().duration = PositionOfFrame(total, rate);
-    m_instance.Begin(m_shape);
-    CProgress progress(total, m_options.quiet);
     // What a file says about its length may be wrong: only what the user has said is a limit.
     const bool limited = AllPictures() || m_options.duration;
+    const uint8_t* inputs[2] = {};
     int64_t frame = 0;
-    for (; !limited || frame < total; ++frame) {
-        const uint8_t* const first = sources.front()->Next();
-        const uint8_t* const inputs[2] = {first, sources.size() == 1 ? first : sources[1]->Next()};
-        if (!inputs[0] || !inputs[1]) {
+    for (; !limited || frame < timeline.total; ++frame) {
+        const int64_t step = frame - timeline.from; // of the effect
+        const bool before = timeline.joined && step < 0;
+        const bool behind = timeline.joined && step >= timeline.count;
+        if (!behind) {
+            const uint8_t* const next = sources[0]->Next();
+            if (!next && !timeline.joined) {
+                break;
+            }
+            inputs[0] = next ? next : inputs[0]; // a first clip that is cut short stands still
+        }
+        if (!before) {
+            inputs[1] = sources.size() == 1 ? inputs[0] : sources[1]->Next();
+        }
+        if (!inputs[before ? 0 : 1]) {
             break;
         }
-        m_instance.Context().position = PositionOfFrame(frame, rate);
-        m_instance.ApplyAnimations(
-            total > 1 ? static_cast<double>(frame) / static_cast<double>(total - 1) : 1);
         Frame output = sink.Take();
-        m_instance.Render(inputs, output.data(), frame);
+        if (before || behind) {
+            std::memcpy(output.data(), inputs[before ? 0 : 1], m_shape.Bytes());
+        } else {
+            m_instance.Context().position = PositionOfFrame(step, rate);
+            m_instance.ApplyAnimations(
+                timeline.count > 1 ? static_cast<double>(step) / double(timeline.count - 1) : 1);
+            m_instance.Render(inputs, output.data(), frame);
+        }
         sink.Put(std::move(output));
         progress.Update(frame + 1);
     }
@@ -368,8 +413,39 @@ void CRendering::RenderClip(const fs::path& file) {
         throw CHostError(ExitStatus::InputUnreadable,
                          TextOf(m_sources.front().file) + " holds no frames");
     }
-    sink.Finish();
-    progress.Finish(frame);
+    return frame;
+}
+
+Timeline CRendering::JoinedTimeline(const Rational& rate) const {
+    if (m_options.start || m_options.duration) {
+        throw CUsageError("--overlap joins whole clips; it does not go with --start or --duration");
+    }
+    int64_t frames[2] = {};
+    for (size_t i = 0; i < 2; ++i) {
+        if (m_sources.size() != 2 || m_sources[i].isPicture || m_sources[i].video.frameCount == 0) {
+            throw CUsageError("--overlap joins two videos that tell their lengths");
+        }
+        frames[i] = std::llround(SecondsOf(m_sources[i].video) * rate.Value());
+    }
+    const int64_t overlap = std::llround(*m_options.overlap * rate.Value());
+    const int64_t most = std::min(frames[0], frames[1]);
+    if (overlap < 1 || overlap > most) {
+        throw CUsageError(
+            "--overlap: " + SecondsText(*m_options.overlap) + " is out of range: one frame to " +
+            SecondsText(static_cast<double>(most) / rate.Value()) + ", the shorter video");
+    }
+    return {frames[0] - overlap, overlap, frames[0] + frames[1] - overlap, true};
+}
+
+SoundJoin CRendering::JoinedSound(const Timeline& timeline, const Rational& rate) const {
+    const auto fileOf = [](const Source& source) {
+        return source.video.audioCodecs.empty() ? fs::path() : source.file;
+    };
+    const auto seconds = [&rate](int64_t frames) {
+        return static_cast<double>(frames) / rate.Value();
+    };
+    return {fileOf(m_sources[0]), fileOf(m_sources[1]), seconds(timeline.from + timeline.count),
+            seconds(timeline.total - timeline.from), seconds(timeline.count)};
 }
 
 } // namespace

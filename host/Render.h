@@ -46,6 +46,8 @@ struct RenderOptions {
     std::optional<double> time;     // seconds: of a still output
     std::optional<double> start;    // seconds left out of videos
     std::optional<double> duration; // seconds of the clip
+    std::optional<double> overlap;  // seconds in which two whole clips meet; they play side by
+                                    // side from start to end otherwise
     std::optional<Rational> rate;
     std::optional<VideoCodec> codec;
     VideoTools tools;

@@ -201,6 +201,35 @@ Arguments EncoderArguments(const VideoFormat& format) {
             matrix};
 }
 
+// Inputs 1 and 2, or only 1 when one clip is silent, mixed into one track.
+Arguments JoinArguments(const SoundJoin& join, const char* codec) {
+    const std::string overlap = Decimal(join.overlapSeconds);
+    const std::string meeting = Decimal(join.firstSeconds - join.overlapSeconds);
+    // Both tracks get the length of their pictures.
+    const std::string first = "[1:a:0]apad,atrim=0:" + Decimal(join.firstSeconds);
+    const std::string second = std::string(join.first.empty() ? "[1" : "[2") +
+                               ":a:0]apad,atrim=0:" + Decimal(join.secondSeconds);
+    std::string filter;
+    if (join.second.empty()) {
+        filter = first + ",afade=t=out:st=" + meeting + ":d=" + overlap + "[s]";
+    } else if (join.first.empty()) {
+        filter = second + ",afade=t=in:d=" + overlap +
+                 ",adelay=delays=" + Decimal((join.firstSeconds - join.overlapSeconds) * 1000) +
+                 ":all=1[s]";
+    } else {
+        filter = first + "[a];" + second + "[b];[a][b]acrossfade=d=" + overlap + "[s]";
+    }
+    Arguments arguments;
+    for (const fs::path& file : {join.first, join.second}) {
+        if (!file.empty()) {
+            arguments.insert(arguments.end(), {"-i", FileArgument(file)});
+        }
+    }
+    arguments.insert(arguments.end(),
+                     {"-filter_complex", filter, "-map", "0:v:0", "-map", "[s]", "-c:a", codec});
+    return arguments;
+}
+
 Arguments WriterArguments(const fs::path& file, const VideoFormat& format) {
     Arguments arguments = {"-v", "error", "-nostdin", "-y"};
     const auto add = [&](const Arguments& more) {
@@ -209,7 +238,9 @@ Arguments WriterArguments(const fs::path& file, const VideoFormat& format) {
     add({"-itsoffset", Decimal(format.startSeconds), "-f", "rawvideo", "-pix_fmt", "bgra"});
     add({"-video_size", SizeText(format.width, format.height)});
     add({"-framerate", TextOf(format.rate), "-thread_queue_size", "8", "-i", "pipe:0"});
-    if (!format.soundFile.empty()) {
+    if (format.join && !(format.join->first.empty() && format.join->second.empty())) {
+        add(JoinArguments(*format.join, format.codec == VideoCodec::Ffv1 ? "flac" : "aac"));
+    } else if (!format.soundFile.empty()) {
         if (format.soundStart > 0) {
             add({"-ss", Decimal(format.soundStart)});
         }

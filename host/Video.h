@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -65,6 +66,13 @@ enum class VideoCodec {
     Ffv1, // every byte kept, alpha included
 };
 
+// The sound of two clips, the second fading in where the first fades out. An empty name is silence.
+struct SoundJoin {
+    std::filesystem::path first, second;
+    double firstSeconds = 0, secondSeconds = 0; // of the clips
+    double overlapSeconds = 0;
+};
+
 // What a written video is made of. The sound comes from the source file, if there is one.
 struct VideoFormat {
     VideoCodec codec = VideoCodec::H264;
@@ -75,9 +83,10 @@ struct VideoFormat {
     bool isBt709 = false;
     std::filesystem::path soundFile; // empty: silent
     std::vector<std::string> audioCodecs;
-    double startSeconds = 0; // of the pictures after the start of the sound file
-    double soundStart = 0;   // seconds of the sound file that are left out
-    double soundSeconds = 0; // of sound at most; 0: all
+    double startSeconds = 0;       // of the pictures after the start of the sound file
+    double soundStart = 0;         // seconds of the sound file that are left out
+    double soundSeconds = 0;       // of sound at most; 0: all
+    std::optional<SoundJoin> join; // in place of the sound file
 };
 
 // Whether the name's extension is one that videos are written to: .mp4 .m4v .mov .mkv

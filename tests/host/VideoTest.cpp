@@ -144,6 +144,39 @@ TEST_F(VideoTest, TwoClipsLastAsLongAsTheShorterOne) {
     EXPECT_TRUE(std::equal(result[6].begin() + last, result[6].end(), second[3].begin() + last));
 }
 
+TEST_F(VideoTest, AnOverlapJoinsTwoClips) {
+    MakeClip("a.mkv");
+    MakeClip("b.mkv");
+    // Nine frames each, four of them in common: five of the first, four of both, five of the
+    // second.
+    Render({"render", "probe-pair", Path("a.mkv"), Path("out.mkv"), "--input2", Path("b.mkv"),
+            "--codec", "ffv1", "--overlap", "0.1334", "--animate", "P2=0:1", "--module",
+            ProbeModule()});
+    const auto clip = Frames("a.mkv"), result = Frames("out.mkv");
+    ASSERT_EQ(result.size(), 14U);
+    const size_t last = size_t{kWidth} * (kHeight - 1);
+    for (size_t i = 0; i < 14; ++i) {
+        if (i < 5 || i >= 9) {
+            EXPECT_EQ(result[i], clip[i < 5 ? i : i - 5]) << i;
+            continue;
+        }
+        EXPECT_EQ(result[i][6], (i - 5) * 1001 * 1000 / 3);
+        EXPECT_EQ(result[i][8], 1334666U); // 4 * 1001 / 30000 s
+        EXPECT_EQ(std::bit_cast<float>(result[i][15]), float(double(i - 5) / 3));
+        EXPECT_TRUE(std::equal(result[i].begin() + kWidth, result[i].begin() + last,
+                               clip[i].begin() + kWidth));
+        EXPECT_TRUE(
+            std::equal(result[i].begin() + last, result[i].end(), clip[i - 5].begin() + last));
+    }
+    EXPECT_NEAR(SoundSeconds("out.mkv"), 14 * 1.001 / 30, 0.03);
+    for (const char* overlap : {"0", "0.4"}) {
+        EXPECT_EQ(RunHost({"render", "probe-pair", Path("a.mkv"), Path("out.mkv"), "--input2",
+                           Path("b.mkv"), "--overlap", overlap, "--module", ProbeModule()})
+                      .status,
+                  2);
+    }
+}
+
 TEST_F(VideoTest, PicturesBecomeAClipAndAClipGivesAPicture) {
     Write("in.png", kWidth, Ramp(kWidth, kHeight));
     Render({"render", "probe", Path("in.png"), Path("clip.mkv"), "--codec", "ffv1", "--duration",
