@@ -82,6 +82,15 @@ const EffectCase kCases[] = {
     {"dreamy", "Kyv_Dsp_Vi_Dreamy", {{"P1", uint8_t{12}}}},
     {"light ray", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}},
     {"light ray, 2 threads", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}, 0, {}, 2},
+    {"bubble", "Kyv_Dsp_Pfx_Bubble", {}, 20000},
+    {"refractive bubble", "Kyv_Dsp_Pfx_RefractiveBubble", {}, 20000},
+    {"fireworks", "Kyv_Dsp_Pfx_Fireworks", {}, 20000},
+    {"fireworks, dense", "Kyv_Dsp_Pfx_Fireworks", {{"P1", 1.0F}, {"P2", 1.0F}}, 20000},
+    {"water ripple", "Kyv_Dsp_Pfx_WaterRipple", {}, 20000},
+    // Every frame is a first visit: a changed parameter forgets what was simulated.
+    {"bubble, cold seek", "Kyv_Dsp_Pfx_Bubble", {{"P1", 0.2F}}, 60000, {{"P1", 0.25F}}},
+    {"fireworks, cold seek", "Kyv_Dsp_Pfx_Fireworks", {{"P1", 0.5F}}, 60000, {{"P1", 0.45F}}},
+    {"water ripple, cold seek", "Kyv_Dsp_Pfx_WaterRipple", {{"P1", 0.5F}}, 60000, {{"P1", 0.45F}}},
 };
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units
@@ -131,7 +140,7 @@ public:
         m_context.cpuLevel = level;
         m_context.threadCount = what.threads;
         m_context.position = int64_t{what.startMs} * 10'000;
-        m_context.duration = int64_t{60} * 10'000'000;
+        m_context.duration = int64_t{3600} * 10'000'000; // never played to its end
         m_ready = effect.callbacks.InitInstance(&m_context) == KYV_OK;
         for (const auto* settings : {&m_settings, &m_alternate}) {
             for (const Setting& setting : *settings) {
