@@ -1,7 +1,8 @@
 // What the benchmarks share: the frames they work on, and how they are listed.
 //
-// Every benchmark treats one frame of 1920x1080 on one thread and is named "operation/form"; the
-// report sets each form against the first of its operation and against a memcpy of the frame.
+// Every benchmark treats one frame of 1920x1080, on one thread unless its name says otherwise, and
+// is named "operation/form"; the report sets each form against the first of its operation and
+// against a memcpy of the frame.
 #pragma once
 
 #include <cstddef>
@@ -21,7 +22,7 @@ inline constexpr size_t kFrameBytes = kPixels * 4;
 
 // The same memory serves all benchmarks, so that none has warmer caches than another.
 struct Frames {
-    std::vector<uint8_t> source[2];
+    std::vector<uint8_t> source[3];
     std::vector<uint8_t> target; // may be made larger
 };
 
@@ -31,9 +32,10 @@ Frames& SharedFrames();
 void Add(const std::string& operation, const std::string& form, std::function<void()> run);
 
 // The same for what needs preparing: make is called once a repetition and gives run, or an empty
-// function when it cannot.
+// function when it cannot. One that works on several threads is timed by the wall clock.
+enum class Clock { Thread, Wall };
 void AddPrepared(const std::string& operation, const std::string& form,
-                 std::function<std::function<void()>()> make);
+                 std::function<std::function<void()>()> make, Clock clock = Clock::Thread);
 
 // Each lists the benchmarks of one file.
 void AddKernels();

@@ -77,11 +77,10 @@ const EffectCase kCases[] = {
     {"pip all", "Kyv_Dsp_Pi_Freeform", PictureWithAll()},
     {"pip all moving", "Kyv_Dsp_Pi_Freeform", PictureWithAll(), 0, {{"P0", 0.11F}}},
     {"alpha transition", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}},
-    {"alpha transition, 2 threads", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}, 0, {}, 2},
+    {"alpha transition x2", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}, 0, {}, 2},
     {"test alpha transition", "DSP_TR_TestAlpha", {{"P1", 0.5F}}},
     {"dreamy", "Kyv_Dsp_Vi_Dreamy", {{"P1", uint8_t{12}}}},
     {"light ray", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}},
-    {"light ray, 2 threads", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}, 0, {}, 2},
     {"bubble", "Kyv_Dsp_Pfx_Bubble", {}, 20000},
     {"refractive bubble", "Kyv_Dsp_Pfx_RefractiveBubble", {}, 20000},
     {"fireworks", "Kyv_Dsp_Pfx_Fireworks", {}, 20000},
@@ -91,6 +90,7 @@ const EffectCase kCases[] = {
     {"bubble, cold seek", "Kyv_Dsp_Pfx_Bubble", {{"P1", 0.2F}}, 60000, {{"P1", 0.25F}}},
     {"fireworks, cold seek", "Kyv_Dsp_Pfx_Fireworks", {{"P1", 0.5F}}, 60000, {{"P1", 0.45F}}},
     {"water ripple, cold seek", "Kyv_Dsp_Pfx_WaterRipple", {{"P1", 0.5F}}, 60000, {{"P1", 0.45F}}},
+    {"light ray x2", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}, 0, {}, 2},
 };
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units
@@ -206,21 +206,22 @@ void AddEffects() {
     for (const EffectCase& what : kCases) {
         for (const uint32_t format : {PixelFormat_Argb, PixelFormat_Ayuv}) {
             for (const int32_t level : {0, 3, 4, 5}) {
-                AddPrepared(std::string("effect ") + what.name +
-                                (format == PixelFormat_Ayuv ? " AYUV" : " ARGB"),
-                            "level " + std::to_string(level),
-                            [&what, format, level]() -> std::function<void()> {
-                                const EffectDescriptor* effect = FindEffect(what.identifier);
-                                if (!effect) {
-                                    return {};
-                                }
-                                const auto player =
-                                    std::make_shared<CPlayer>(*effect, what, format, level);
-                                if (!player->IsReady()) {
-                                    return {};
-                                }
-                                return [player] { player->Play(); };
-                            });
+                AddPrepared(
+                    std::string("effect ") + what.name +
+                        (format == PixelFormat_Ayuv ? " AYUV" : " ARGB"),
+                    "level " + std::to_string(level),
+                    [&what, format, level]() -> std::function<void()> {
+                        const EffectDescriptor* effect = FindEffect(what.identifier);
+                        if (!effect) {
+                            return {};
+                        }
+                        const auto player = std::make_shared<CPlayer>(*effect, what, format, level);
+                        if (!player->IsReady()) {
+                            return {};
+                        }
+                        return [player] { player->Play(); };
+                    },
+                    what.threads > 1 ? Clock::Wall : Clock::Thread);
             }
         }
     }

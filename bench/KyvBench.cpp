@@ -42,9 +42,11 @@ public:
             row.name = run.run_name.function_name;
             row.failed = row.failed || run.error_occurred;
             if (run.run_type == Run::RT_Iteration && !run.error_occurred) {
-                // The thread's own time: what other programs take does not count.
-                row.ns.push_back(run.cpu_accumulated_time * 1e9 /
-                                 static_cast<double>(run.iterations));
+                // The thread's own time: what other programs take does not count. Work on several
+                // threads can only be timed by the wall clock.
+                const double seconds = run.run_name.time_type.empty() ? run.cpu_accumulated_time
+                                                                      : run.real_accumulated_time;
+                row.ns.push_back(seconds * 1e9 / static_cast<double>(run.iterations));
             }
         }
     }
@@ -85,24 +87,27 @@ private:
 } // namespace
 
 Frames& SharedFrames() {
-    static Frames frames = {{MakePicture(1), MakePicture(2)}, MakePicture(3)};
+    static Frames frames = {{MakePicture(1), MakePicture(2), MakePicture(4)}, MakePicture(3)};
     return frames;
 }
 
 void AddPrepared(const std::string& operation, const std::string& form,
-                 std::function<std::function<void()>()> make) {
-    benchmark::RegisterBenchmark((operation + "/" + form).c_str(),
-                                 [make = std::move(make)](benchmark::State& state) {
-                                     const std::function<void()> run = make();
-                                     if (!run) {
-                                         state.SkipWithError("cannot be prepared");
-                                         return;
-                                     }
-                                     for ([[maybe_unused]] auto _ : state) {
-                                         run();
-                                         benchmark::ClobberMemory();
-                                     }
-                                 });
+                 std::function<std::function<void()>()> make, Clock clock) {
+    auto* added = benchmark::RegisterBenchmark((operation + "/" + form).c_str(),
+                                               [make = std::move(make)](benchmark::State& state) {
+                                                   const std::function<void()> run = make();
+                                                   if (!run) {
+                                                       state.SkipWithError("cannot be prepared");
+                                                       return;
+                                                   }
+                                                   for ([[maybe_unused]] auto _ : state) {
+                                                       run();
+                                                       benchmark::ClobberMemory();
+                                                   }
+                                               });
+    if (clock == Clock::Wall) {
+        added->UseRealTime();
+    }
 }
 
 void Add(const std::string& operation, const std::string& form, std::function<void()> run) {
