@@ -48,7 +48,7 @@ const Scene kScenes[] = {
     {"Kyv_Dsp_Vi_Dreamy", 0, {"P1=20"}},
     {"Kyv_Dsp_Vi_LightRay", 0, {"P2=0.5,0.3"}},
     {"Dsp_Vi_PencilSketch2", 0, {}},
-    {"Kyv_Dsp_Co_Temperature", 0, {"P1=0.5"}},
+    {"Kyv_Dsp_Co_Temperature", 0, {"P1=-0.5"}},
     {"Kyv_Dsp_Co_WhiteBalance", 0, {"P1=#FFD9A0"}},
 };
 
