@@ -41,13 +41,19 @@ constexpr TriangleOrder OrderByHeight(const RasterPoint (&v)[3]) {
 // emit(y, first, last) for every row of the triangle, first <= last.
 template <class Emit>
 void WalkTriangle(const RasterPoint (&vertices)[3], Emit&& emit) {
-    // Wraps where 32 bits do not hold the products. The ends differ in height, and a difference
-    // that wraps to -1 must not meet the one quotient that does not fit.
+    // Wraps where 32 bits do not hold the products; a difference that wraps to -1 must not meet the
+    // one quotient that does not fit.
     constexpr auto interpolate = [](RasterPoint from, RasterPoint to, int32_t y) {
         const int32_t sum =
             WrapAdd(WrapMul(to.x, WrapSub(y, from.y)), WrapMul(from.x, WrapSub(to.y, y)));
-        const int32_t height = WrapSub(to.y, from.y);
-        return height == -1 ? WrapSub(0, sum) : sum / height;
+        switch (const int32_t height = WrapSub(to.y, from.y)) {
+        case 0:
+            return to.x;
+        case -1:
+            return WrapSub(0, sum);
+        default:
+            return sum / height;
+        }
     };
     const TriangleOrder t = OrderByHeight(vertices);
     for (int64_t row = t.top.y; row <= t.bottom.y; ++row) {
