@@ -247,7 +247,8 @@ RasterPoint Offset(RasterPoint point, RasterPointF normal, float by) {
 
 template <class Canvas>
 void DrawBorderShapes(Canvas& canvas, const RasterPoint (&quad)[4], int32_t size) {
-    const auto half = static_cast<float>(size / 2);
+    const int32_t wholeHalf = size / 2;
+    const auto half = static_cast<float>(wholeHalf);
     RasterPointF normals[4];
     for (int i = 0; i < 4; ++i) {
         normals[i] = UnitNormal(quad[i], quad[(i + 1) % 4]);
@@ -270,7 +271,7 @@ void DrawBorderShapes(Canvas& canvas, const RasterPoint (&quad)[4], int32_t size
         canvas.Triangle({quad[i], Offset(quad[i], before, side), Offset(quad[i], after, side)});
     }
     for (const RasterPoint& corner : quad) {
-        canvas.Disc(corner, size / 2 - 1);
+        canvas.Disc(corner, wholeHalf - 1);
     }
 }
 

@@ -16,7 +16,7 @@ constexpr float kPi = 3.1415927F;
 float Sine(float angle) {
     constexpr double kPiHigh = 0x1.921fb54442d18p+1;
     constexpr double kPiLow = 0x1.1a62633145c07p-53;
-    const int turns = static_cast<int>(angle / kPiHigh + 0.5);
+    const int turns = static_cast<int>(std::floor(angle / kPiHigh + 0.5));
     const double x = (angle - turns * kPiHigh) - turns * kPiLow;
     const double x2 = x * x;
     double term = x;
