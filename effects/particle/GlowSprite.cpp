@@ -26,10 +26,12 @@ float Brightness(float distance, float radius) {
 // The mean over a pixel whose top left corner is (x, y) from the centre, in pixels.
 float PixelBrightness(float x, float y, float radius) {
     float sum = 0.0F;
-    for (int i = 0; i < kSamples * kSamples; ++i) {
-        const float dx = x + (static_cast<float>(i % kSamples) + 0.5F) / kSamples;
-        const float dy = y + (static_cast<float>(i / kSamples) + 0.5F) / kSamples;
-        sum += Brightness(std::sqrt(dx * dx + dy * dy), radius);
+    for (int row = 0; row < kSamples; ++row) {
+        const float dy = y + (static_cast<float>(row) + 0.5F) / kSamples;
+        for (int column = 0; column < kSamples; ++column) {
+            const float dx = x + (static_cast<float>(column) + 0.5F) / kSamples;
+            sum += Brightness(std::sqrt(dx * dx + dy * dy), radius);
+        }
     }
     return sum / (kSamples * kSamples);
 }
