@@ -239,11 +239,11 @@ private:
     void MakeLayers(const CImageARGB& foreground) {
         RenderPicture(foreground);
         if (m_settings.border.enabled) {
-            m_work.border.Reset(foreground, m_ayuv);
+            m_work.border.Reset(foreground, m_ayuv, TransparentBlack(m_ayuv));
             MakeBorder();
         }
         if (m_settings.shadow.enabled) {
-            m_work.shadow.Reset(foreground, m_ayuv);
+            m_work.shadow.Reset(foreground, m_ayuv, TransparentBlack(m_ayuv));
             MakeShadow();
         }
         // These are cut from unblurred coverage, so all blurring comes after.
@@ -270,15 +270,19 @@ private:
 
     void RenderPicture(const CImageARGB& foreground) {
         CPipLayer& layer = m_work.picture;
+        // Keying takes a whole AYUV frame through RGB, from where zeros come back as something
+        // else.
+        const bool convertsClear = m_ayuv && m_settings.key.enabled;
         // Through the same map the same pixels are drawn again, and the others are still clear.
-        if (m_pip.IsDirty() || !layer.Fits(foreground, m_ayuv)) {
-            layer.Reset(foreground, m_ayuv);
+        if (m_pip.IsDirty() || convertsClear || !layer.Fits(foreground, m_ayuv)) {
+            layer.Reset(foreground, m_ayuv, 0);
         }
         const PixelBox box = PictureBox(Frame());
         if (box.IsEmpty()) {
             return;
         }
-        layer.Use(box);
+        // With all that a blur will look at.
+        layer.Use(convertsClear ? box.Grown(2 * m_settings.picture.blur) : box);
         m_pip.Render(foreground, layer.Image());
         if (m_settings.key.enabled) {
             layer.ColorKey(m_settings.key.color, m_settings.key.tolerance);

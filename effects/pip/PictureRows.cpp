@@ -9,8 +9,7 @@ CPictureRows::CPictureRows(int32_t width, const PixelBox& box, const PictureKey&
                            int32_t cpuLevel, CRowSink& sink)
     : m_width(static_cast<size_t>(width)), m_box(box), m_key(key), m_bAyuv(ayuv), m_sink(sink),
       m_pKeyRow(kColorKeyRow.For(Resolve(cpuLevel))), m_pToArgb(kToARGB.For(Resolve(cpuLevel))),
-      m_pToAyuv(kToAYUV.For(Resolve(cpuLevel))), m_rows(2 * m_width, ClearPixel(ayuv)),
-      m_nNext(box.top) {}
+      m_pToAyuv(kToAYUV.For(Resolve(cpuLevel))), m_rows(2 * m_width), m_nNext(box.top) {}
 
 uint8_t* CPictureRows::Row(int32_t y) {
     // The row above this one is complete, but it may still be looked at.
@@ -45,7 +44,7 @@ void CPictureRows::FinishRow() {
         }
     }
     m_sink.Take(y, row);
-    std::fill_n(Slot(y) + m_box.left, count, ClearPixel(m_bAyuv));
+    std::fill_n(Slot(y) + m_box.left, count, 0);
 }
 
 } // namespace kyv

@@ -26,7 +26,7 @@ Function FormFor(const KernelTable<Function>& table, const CImageARGB& image) {
 
 } // namespace
 
-void CPipLayer::Reset(const CImageARGB& frame, bool ayuv) {
+void CPipLayer::Reset(const CImageARGB& frame, bool ayuv, uint32_t clear) {
     if (!m_image.GetBuffer() || !m_image.IsSameSize(frame)) {
         m_used = {};
         m_image.Create(frame.GetWidth(), frame.GetHeight());
@@ -40,7 +40,7 @@ void CPipLayer::Reset(const CImageARGB& frame, bool ayuv) {
     m_pBlendRow = FormFor(kAlphaBlend, m_image);
     for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
         auto* row = reinterpret_cast<uint32_t*>(At(m_image, m_used.left, y));
-        std::fill_n(row, std::max(m_used.Width(), 0), ClearPixel(ayuv));
+        std::fill_n(row, std::max(m_used.Width(), 0), clear);
     }
     m_used = {};
 }

@@ -2,8 +2,6 @@
 // covered, and the passes over them.
 //
 // A layer is clear outside the part in use, so every pass and every blend touches that part alone.
-// Clear is transparent black: zeros in an ARGB layer, and the black of AYUV in an AYUV one. Zeros
-// there would be a green that a blur draws into every rim.
 #pragma once
 
 #include <algorithm>
@@ -48,15 +46,16 @@ struct LayerColor {
     bool operator==(const LayerColor&) const = default;
 };
 
-// Transparent black.
-constexpr uint32_t ClearPixel(bool ayuv) {
+// Transparent black. Zeros in an AYUV layer would be a green that a blur draws into every rim; the
+// picture starts from zeros all the same, and so does what it takes out of the border.
+constexpr uint32_t TransparentBlack(bool ayuv) {
     return ayuv ? 0x00108080 : 0;
 }
 
 class CPipLayer {
 public:
-    // Gives the layer the form of a frame and clears it. Throws std::bad_alloc.
-    void Reset(const KYVImageUtility::CImageARGB& frame, bool ayuv);
+    // Gives the layer the form of a frame and fills it with what is clear. Throws std::bad_alloc.
+    void Reset(const KYVImageUtility::CImageARGB& frame, bool ayuv, uint32_t clear);
     // True when the layer has that form already and shows nothing but what has been drawn since it
     // was cleared: to draw at the same places again then needs no clearing before.
     bool Fits(const KYVImageUtility::CImageARGB& frame, bool ayuv) const;
@@ -70,8 +69,8 @@ public:
     const PixelBox& Used() const { return m_used; }
     void Use(const PixelBox& box) { m_used = box.CutTo(Frame()); }
 
-    // Clears the layer wherever another one is covered.
-    void ClearUnder(const CPipLayer& layer) { Stamp(layer, 0, 0, ClearPixel(m_bAyuv)); }
+    // Zeros all four bytes wherever another layer is covered.
+    void ClearUnder(const CPipLayer& layer) { Stamp(layer, 0, 0, 0); }
 
     // Writes a pixel wherever another layer, moved by (dx, dy), is covered. Only what falls into
     // the part in use is written.

@@ -119,12 +119,12 @@ public:
         if (m_p.key) {
             Key(picture);
         }
-        Frame border(picture.size(), Clear()), shadow(picture.size(), Clear());
+        Frame border(picture.size(), Black()), shadow(picture.size(), Black());
         if (m_p.border) {
             DrawBorder(border, size);
             for (size_t i = 0; i < border.size(); ++i) {
                 if (picture[i] >> 24) {
-                    border[i] = Clear();
+                    border[i] = 0;
                 }
             }
             Gradient(border, wide, m_p.borderType, m_p.borderColors);
@@ -179,7 +179,7 @@ public:
 
 private:
     size_t At(int x, int y) const { return static_cast<size_t>(y * m_width + x); }
-    uint32_t Clear() const { return m_ayuv ? 0x00108080 : 0; }
+    uint32_t Black() const { return m_ayuv ? 0x00108080 : 0; } // transparent
 
     // A parameter's colour as the low 24 bits of a pixel.
     uint32_t Color(uint32_t color) const {
@@ -210,7 +210,7 @@ private:
     }
 
     Frame Picture(const Frame& source) const {
-        Frame layer(source.size(), Clear());
+        Frame layer(source.size());
         const RasterPoint q[4] = {
             {m_x[0], m_y[0]}, {m_x[1], m_y[1]}, {m_x[2], m_y[2]}, {m_x[3], m_y[3]}};
         const double ex = q[1].x - q[0].x, ey = q[1].y - q[0].y;
