@@ -80,6 +80,7 @@ const EffectCase kCases[] = {
     {"alpha transition x2", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}, 0, {}, 2},
     {"test alpha transition", "DSP_TR_TestAlpha", {{"P1", 0.5F}}},
     {"dreamy", "Kyv_Dsp_Vi_Dreamy", {{"P1", uint8_t{12}}}},
+    {"pencil sketch", "Dsp_Vi_PencilSketch2"},
     {"light ray", "Kyv_Dsp_Vi_LightRay", {{"P2", std::array{0.6F, 0.2F}}}},
     {"bubble", "Kyv_Dsp_Pfx_Bubble", {}, 20000},
     {"refractive bubble", "Kyv_Dsp_Pfx_RefractiveBubble", {}, 20000},

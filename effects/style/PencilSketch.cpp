@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "effects/style/PencilFilter.h"
 #include "effects/style/StyleCall.h"
 
 namespace kyv {
@@ -46,11 +47,19 @@ KyvStatus PencilSketch::Process(EffectContext& context, Instance& instance) {
                     settings)) {
         return KYV_OK;
     }
-    CopyView(geometry, context.frame, instance.input);
+    if (!instance.filter) {
+        instance.filter = new CPencilFilter;
+    }
+    instance.filter->Render(MakeStyleFrame(context, geometry, instance.input),
+                            {static_cast<int32_t>(settings.strokeSize), settings.edgeThreshold,
+                             settings.edgeIntensity, settings.texture},
+                            mask);
     return KYV_OK;
 }
 
 void PencilSketch::Release(EffectContext& context, Instance& instance) {
+    delete instance.filter;
+    instance.filter = nullptr;
     HandBackGpu(context, instance.gpu);
 }
 

@@ -17,12 +17,15 @@
 
 namespace kyv {
 
+class CPencilFilter;
+
 struct PencilSketch {
     struct Instance {
         void* input;
         GpuBinding gpu;
-        uint32_t randomSeed; // the context's at BeginProcessing
-        uint8_t reserved[52];
+        CPencilFilter* filter; // made with the first frame on the processor
+        uint32_t randomSeed;   // the context's at BeginProcessing
+        uint8_t reserved[44];
     };
     static_assert(sizeof(Instance) == 96);
 

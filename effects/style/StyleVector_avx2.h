@@ -81,4 +81,14 @@ static inline __m256i LoadBytes(const uint8_t* from) {
     return _mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(from)));
 }
 
+// Sixteen bytes as words, and back.
+static inline __m256i LoadWide(const uint8_t* from) {
+    return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(from)));
+}
+static inline void StoreNarrow(uint8_t* to, __m256i words) {
+    _mm_storeu_si128(
+        reinterpret_cast<__m128i*>(to),
+        _mm_packus_epi16(_mm256_castsi256_si128(words), _mm256_extracti128_si256(words, 1)));
+}
+
 } // namespace kyv

@@ -82,4 +82,13 @@ static inline __m128i LoadBytes(const uint8_t* from) {
     return _mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(bytes), zero), zero);
 }
 
+// Eight bytes as words, and back.
+static inline __m128i LoadWide(const uint8_t* from) {
+    return _mm_unpacklo_epi8(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(from)),
+                             _mm_setzero_si128());
+}
+static inline void StoreNarrow(uint8_t* to, __m128i words) {
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(to), _mm_packus_epi16(words, words));
+}
+
 } // namespace kyv

@@ -59,7 +59,8 @@ protected:
 };
 
 INSTANTIATE_TEST_SUITE_P(All, StyleFilter,
-                         testing::Values("Kyv_Dsp_Vi_Dreamy", "Kyv_Dsp_Vi_LightRay"),
+                         testing::Values("Kyv_Dsp_Vi_Dreamy", "Kyv_Dsp_Vi_LightRay",
+                                         "Dsp_Vi_PencilSketch2"),
                          [](const auto& entry) {
                              const std::string name = entry.param;
                              return name.substr(name.rfind('_') + 1);
@@ -69,11 +70,15 @@ TEST_P(StyleFilter, LevelsAndThreadsAgreeAtEverySize) {
     for (const auto& [width, height] :
          {std::pair{1U, 1U}, {1U, 9U}, {2U, 2U}, {9U, 1U}, {3U, 70U}, {67U, 41U}, {163U, 120U}}) {
         for (const Frame& input : {Scene(width, height), RandomFrame(size_t{width} * height, 4)}) {
+            // In one instance, whose textures take a while to draw.
+            CTestInstance instance(Effect(GetParam()), width, height);
+            ASSERT_EQ(instance.Begin(), KYV_OK);
             const auto at = [&](int32_t level, uint32_t threads) {
-                return On(input, width, [&](CTestInstance& instance) {
-                    instance.Context().cpuLevel = level;
-                    instance.Context().threadCount = threads;
-                });
+                instance.Context().cpuLevel = level;
+                instance.Context().threadCount = threads;
+                Frame output(input.size());
+                EXPECT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+                return output;
             };
             const Frame scalar = at(0, 1);
             for (const int32_t level : {1, 3, 4, 5}) {
@@ -201,7 +206,8 @@ protected:
 };
 
 INSTANTIATE_TEST_SUITE_P(All, StyleMask,
-                         testing::Values(Masked{"Kyv_Dsp_Vi_Dreamy", "P2", "P3", "P4", "P5"}),
+                         testing::Values(Masked{"Kyv_Dsp_Vi_Dreamy", "P2", "P3", "P4", "P5"},
+                                         Masked{"Dsp_Vi_PencilSketch2", "P4", "P5", "P6", "P7"}),
                          [](const auto& entry) {
                              return std::string(entry.param.effect).substr(8, 6);
                          });
@@ -320,6 +326,78 @@ TEST(LightRay, StreamsAwayFromItsPlaceAndOnlyBrightens) {
         for (int c = 0; c < 24; c += 8) {
             ASSERT_GE(fromLeft[i] >> c & 255, input[i] >> c & 255) << i;
         }
+    }
+}
+
+TEST(PencilSketch, DrawsContoursAndDarkerToneOnPaper) {
+    constexpr uint32_t kWidth = 200, kHeight = 120;
+    const auto render = [&](const Frame& input, const Prepare& prepare = {}) {
+        return Render("Dsp_Vi_PencilSketch2", input, kWidth, prepare);
+    };
+    const auto mean = [&](const Frame& frame, uint32_t left, uint32_t right) {
+        uint32_t sum = 0;
+        for (uint32_t y = 0; y < kHeight; ++y) {
+            for (uint32_t x = left; x < right; ++x) {
+                sum += frame[size_t{y} * kWidth + x] >> 8 & 255;
+            }
+        }
+        return sum / kHeight / (right - left);
+    };
+    // White stays paper but for its tooth; the darker the tone, the darker the drawing.
+    uint32_t last = 256;
+    for (const uint32_t gray : {255U, 190U, 130U, 70U, 0U}) {
+        const uint32_t tone =
+            mean(render(Frame(size_t{kWidth} * kHeight, gray * 0x10101)), 0, kWidth);
+        EXPECT_LT(tone, last) << gray;
+        last = tone;
+    }
+    EXPECT_GE(mean(render(Frame(size_t{kWidth} * kHeight, 0xFFFFFF)), 0, kWidth), 232U);
+    EXPECT_LE(last, 110U);
+
+    // A step between two bright greys: a line on its darker side, which a higher threshold or a
+    // lower intensity takes away or pales.
+    Frame step(size_t{kWidth} * kHeight, 0xFFFFFF);
+    for (size_t i = 0; i < step.size(); ++i) {
+        step[i] = i % kWidth < 100 ? 0xFFFFFF : 0xC8C8C8;
+    }
+    const auto line = [&](uint8_t threshold, uint8_t intensity) {
+        const Frame drawn = render(step, [&](CTestInstance& instance) {
+            instance.Set("P2", threshold);
+            instance.Set("P3", intensity);
+        });
+        return static_cast<int>(mean(drawn, 110, 190)) - static_cast<int>(mean(drawn, 100, 102));
+    };
+    EXPECT_GT(line(10, 100), 40);
+    EXPECT_GT(line(10, 100), line(10, 20) + 10);
+    EXPECT_GT(line(10, 100), line(230, 100) + 10);
+}
+
+TEST(PencilSketch, RandomStrokesFollowSeedAndPositionAlone) {
+    const Frame input = Scene(120, 80);
+    const auto at = [&](uint32_t random, uint32_t seed, int64_t position) {
+        return Render("Dsp_Vi_PencilSketch2", input, 120, [&](CTestInstance& instance) {
+            instance.Set("P8", random);
+            instance.Context().randomSeed = seed;
+            instance.Context().position = position;
+        });
+    };
+    EXPECT_EQ(at(0, 1, 0), at(0, 2, 400000)) << "the texture stands still";
+    EXPECT_NE(at(1, 1, 0), at(0, 1, 0));
+    EXPECT_NE(at(1, 1, 0), at(1, 1, 400000));
+    EXPECT_NE(at(1, 1, 0), at(1, 2, 0));
+    EXPECT_EQ(at(1, 1, 400000), at(1, 1, 400000));
+
+    // The seed counts as it was when the instance was prepared.
+    CTestInstance instance(Effect("Dsp_Vi_PencilSketch2"), 120, 80);
+    instance.Set("P8", 1U);
+    instance.Context().randomSeed = 1;
+    ASSERT_EQ(instance.Begin(), KYV_OK);
+    instance.Context().randomSeed = 2;
+    Frame output(input.size());
+    for (const int64_t position : {900000, 0, 400000}) { // a seek repeats what playing showed
+        instance.Context().position = position;
+        ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+        EXPECT_EQ(output, at(1, 1, position));
     }
 }
 

@@ -6,6 +6,7 @@
 #include "effects/style/DreamyRow.h"
 #include "effects/style/HighlightRow.h"
 #include "effects/style/MaskMixRow.h"
+#include "effects/style/PencilRow.h"
 #include "effects/style/RayRow.h"
 #include "effects/style/ShrinkRow.h"
 #include "tests/support/KernelRows.h"
@@ -103,6 +104,27 @@ auto BindRayStep(uint32_t seed) {
     };
 }
 
+auto BindLine(uint32_t seed) {
+    const kyv::PencilLine line = {static_cast<uint8_t>(seed % 3 == 0 ? 0 : seed * 7),
+                                  static_cast<uint8_t>(seed * 31)};
+    return [line](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        form(dst, src[0], src[1], count, line);
+    };
+}
+
+auto BindInk(uint32_t seed) {
+    std::mt19937 random(seed);
+    kyv::PencilTone tone = {};
+    for (kyv::HatchTone& layer : tone.layers) {
+        layer = {static_cast<uint8_t>(random()), static_cast<uint8_t>(random())};
+    }
+    tone.rubbing = static_cast<uint8_t>(random());
+    return [tone](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        form(dst, {src[0], src[1], src[2], {src[3], src[4], src[5], src[6]}, src[7], src[8]}, count,
+             tone);
+    };
+}
+
 } // namespace
 
 void AddStyle(std::vector<KernelEntry>& list) {
@@ -140,6 +162,33 @@ void AddStyle(std::vector<KernelEntry>& list) {
                         [](uint32_t) {
                             return [](auto form, uint8_t* dst, const uint8_t* const* src,
                                       size_t count) { form(dst, src[0], src[1], count); };
+                        }));
+    list.push_back(Rows(kyv::kSmoothRow,
+                        {.table = "kSmoothRow",
+                         .dstBytes = 1,
+                         .inPlace = true,
+                         .sourceBytes = {1, 1, 1},
+                         .inputBits = {8, 8, 8}},
+                        [](uint32_t) {
+                            return [](auto form, uint8_t* dst, const uint8_t* const* src,
+                                      size_t count) { form(dst, src[0], src[1], src[2], count); };
+                        }));
+    list.push_back(Rows(kyv::kPencilLineRow,
+                        {.table = "kPencilLineRow",
+                         .dstBytes = 1,
+                         .inPlace = true,
+                         .sourceBytes = {1, 1},
+                         .inputBits = {8, 8}},
+                        BindLine));
+    list.push_back(
+        Rows(kyv::kPencilInkRow,
+             {.table = "kPencilInkRow", .dstBytes = 1, .sourceBytes = {1, 1, 1, 1, 1, 1, 1, 1, 1}},
+             BindInk));
+    list.push_back(Rows(kyv::kPencilPaperRow,
+                        {.table = "kPencilPaperRow", .inPlace = true, .sourceBytes = {4, 1, 1}},
+                        [](uint32_t) {
+                            return [](auto form, uint8_t* dst, const uint8_t* const* src,
+                                      size_t count) { form(dst, src[0], src[1], src[2], count); };
                         }));
 }
 
