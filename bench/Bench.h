@@ -23,7 +23,8 @@ inline constexpr size_t kFrameBytes = kPixels * 4;
 // The same memory serves all benchmarks, so that none has warmer caches than another.
 struct Frames {
     std::vector<uint8_t> source[3];
-    std::vector<uint8_t> target; // may be made larger
+    std::vector<uint8_t> target;     // may be made larger
+    std::vector<uint8_t> large = {}; // for sources that are larger than a frame
 };
 
 Frames& SharedFrames();

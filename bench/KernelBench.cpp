@@ -1,7 +1,7 @@
 // Every form of every kernel in the catalogue of the tests.
 #include "bench/Bench.h"
 
-#include <algorithm>
+#include <iterator>
 
 #include "tests/support/KernelCatalog.h"
 
@@ -13,7 +13,20 @@ using kyv::InstructionSet;
 
 constexpr uint32_t kSeed = 1; // chooses the kernels' parameters
 
-// One run over a frame. Kernels that scale get a source of another width, cut to what there is.
+// A source of that many bytes. What a frame does not hold comes from memory that large sources
+// share.
+const uint8_t* SourceOf(Frames& frames, size_t index, size_t bytes) {
+    const std::vector<uint8_t>& frame = frames.source[index % std::size(frames.source)];
+    if (bytes <= frame.size()) {
+        return frame.data();
+    }
+    while (frames.large.size() < bytes) {
+        frames.large.insert(frames.large.end(), frame.begin(), frame.end());
+    }
+    return frames.large.data();
+}
+
+// One run over a frame. Kernels that scale get a source of another size.
 std::function<void()> MakeRun(const KernelEntry& entry, InstructionSet set) {
     Frames& frames = SharedFrames();
     const Size frame = {kWidth, kHeight};
@@ -22,11 +35,11 @@ std::function<void()> MakeRun(const KernelEntry& entry, InstructionSet set) {
         frames.target.resize(needed);
     }
     KernelBuffers buffers = {frames.target.data(), ptrdiff_t{kWidth} * entry.dstBytes, frame, {}};
-    Size size = entry.sourceSize ? entry.sourceSize(frame, kSeed) : frame;
-    size = {std::min(size.width, kWidth), std::min(size.height, kHeight)};
+    const Size size = entry.sourceSize ? entry.sourceSize(frame, kSeed) : frame;
     for (size_t i = 0; i < entry.sourceBytes.size(); ++i) {
+        const ptrdiff_t pitch = ptrdiff_t{size.width} * entry.sourceBytes[i];
         buffers.sources.push_back(
-            {frames.source[i].data(), ptrdiff_t{size.width} * entry.sourceBytes[i], size});
+            {SourceOf(frames, i, static_cast<size_t>(pitch) * size.height), pitch, size});
     }
     return [run = entry.prepare(kSeed), set, buffers] { run(set, buffers); };
 }

@@ -32,9 +32,12 @@ auto BindAdd(uint32_t) {
     };
 }
 
+int32_t ShrinkBits(uint32_t seed) {
+    return static_cast<int32_t>(seed % (kyv::kMostShrinkBits + 1));
+}
+
 auto BindAverage(uint32_t seed) {
-    const auto bits = static_cast<int32_t>(seed % (kyv::kMostShrinkBits + 1));
-    return [bits](kyv::AverageRow form, const KernelBuffers& buffers) {
+    return [bits = ShrinkBits(seed)](kyv::AverageRow form, const KernelBuffers& buffers) {
         const auto count = static_cast<size_t>(buffers.size.width);
         const auto limit = static_cast<uint16_t>(255 << bits);
         for (int32_t y = 0; y < buffers.size.height; ++y) {
@@ -135,8 +138,8 @@ void AddStyle(std::vector<KernelEntry>& list) {
                           {.table = "kAverageRow",
                            .sourceBytes = {8},
                            .sourceSize =
-                               [](Size dst, uint32_t) {
-                                   return Size{dst.width << kyv::kMostShrinkBits, dst.height};
+                               [](Size dst, uint32_t seed) {
+                                   return Size{dst.width << ShrinkBits(seed), dst.height};
                                }},
                           BindAverage));
     list.push_back(Rows(kyv::kHighlightRow,
