@@ -6,6 +6,7 @@
 
 #include "effects/style/HighlightRow.h"
 #include "effects/style/RayRow.h"
+#include "effects/style/StyleMath.h"
 #include "threading/RowBand.h"
 
 namespace kyv {
@@ -221,7 +222,8 @@ void CLightRayFilter::Finish(int32_t first, int32_t end) {
             const float strongest = std::max({light[i], light[i + 1], light[i + 2]});
             const float factor = kFullLight * gain / (1.0F + strongest * gain);
             for (int32_t c = i; c < i + 4; ++c) {
-                pixels[c] = static_cast<uint8_t>(static_cast<float>(light[c]) * factor + 0.5F);
+                pixels[c] =
+                    static_cast<uint8_t>(RoundHalfUp(static_cast<float>(light[c]) * factor));
             }
         }
     }

@@ -8,6 +8,7 @@
 
 #include "effects/style/MaskMixRow.h"
 #include "effects/style/PencilRow.h"
+#include "effects/style/StyleMath.h"
 #include "imageutility/kernels/ToGray.h"
 
 namespace kyv {
@@ -148,7 +149,7 @@ void CPencilFilter::Render(const StyleFrame& frame, const PencilSettings& settin
         kPencilLineRow.For(m_set)(narrow->Row(y), narrow->Row(y), wide->Row(y),
                                   static_cast<size_t>(m_width), line);
     }
-    const auto aside = static_cast<int32_t>(1.3F * scale + 0.5F);
+    const auto aside = RoundHalfUp(1.3F * scale);
     DrawRows(frame, *narrow, *wide, aside, aside);
 }
 

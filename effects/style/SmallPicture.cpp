@@ -6,6 +6,7 @@
 #include <cstring>
 
 #include "effects/style/ShrinkRow.h"
+#include "effects/style/StyleMath.h"
 #include "imageutility/kernels/Bilinear.h"
 
 namespace kyv {
@@ -106,8 +107,7 @@ void CSmallPicture::Blur(float sigma) {
         ++radius;
     }
     const float missing = wanted - static_cast<float>(3 * radius * (radius + 1));
-    const int32_t wider =
-        static_cast<int32_t>(missing / static_cast<float>(2 * (radius + 1)) + 0.5F);
+    const int32_t wider = RoundHalfUp(missing / static_cast<float>(2 * (radius + 1)));
     for (int32_t pass = 0; pass < 3; ++pass) {
         const int32_t r = radius + (pass < wider ? 1 : 0);
         if (r > 0) {

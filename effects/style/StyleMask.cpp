@@ -6,6 +6,8 @@
 #include <utility>
 #include <vector>
 
+#include "effects/style/StyleMath.h"
+
 namespace kyv {
 namespace {
 
@@ -22,7 +24,7 @@ float SmoothStep(float t) {
 }
 
 uint8_t ToWeight(float inside, bool outside) {
-    const int32_t weight = static_cast<int32_t>(inside * 255.0F + 0.5F);
+    const int32_t weight = RoundHalfUp(inside * 255.0F);
     return static_cast<uint8_t>(outside ? 255 - weight : weight);
 }
 

@@ -21,4 +21,10 @@ constexpr uint32_t StyleProduct(uint32_t a, uint32_t b) {
     return (t + (t >> 8)) >> 8;
 }
 
+// The nearest integer of a value that is not negative; halves go up.
+constexpr int32_t RoundHalfUp(float value) {
+    const float raised = value + 0.5F;
+    return static_cast<int32_t>(raised);
+}
+
 } // namespace kyv
