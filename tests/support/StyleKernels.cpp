@@ -1,5 +1,5 @@
 // The catalogue's entries of the style effects.
-#include <cstring>
+#include <algorithm>
 #include <random>
 #include <vector>
 
@@ -17,7 +17,7 @@ namespace {
 // Sums of rows lie in memory as words, aligned as they are.
 std::vector<uint16_t> WordsOf(const uint8_t* bytes, size_t count, uint16_t limit) {
     std::vector<uint16_t> words(count);
-    std::memcpy(words.data(), bytes, count * 2);
+    std::copy_n(bytes, count * 2, reinterpret_cast<uint8_t*>(words.data())); // count may be 0
     for (uint16_t& word : words) {
         word = static_cast<uint16_t>(word % (limit + 1U));
     }
@@ -28,7 +28,7 @@ auto BindAdd(uint32_t) {
     return [](kyv::AddRow form, uint8_t* dst, const uint8_t* const* src, size_t count) {
         std::vector<uint16_t> sums = WordsOf(dst, count, 65280 - 255);
         form(sums.data(), src[0], count);
-        std::memcpy(dst, sums.data(), count * 2);
+        std::copy_n(reinterpret_cast<const uint8_t*>(sums.data()), count * 2, dst);
     };
 }
 
@@ -83,7 +83,7 @@ auto BindRayLerp(uint32_t seed) {
         const auto lower = LightOf(src[1], count);
         std::vector<uint16_t> result(count);
         form(result.data(), upper.data(), lower.data(), count, fraction);
-        std::memcpy(dst, result.data(), count * 2);
+        std::copy_n(reinterpret_cast<const uint8_t*>(result.data()), count * 2, dst);
     };
 }
 
@@ -103,7 +103,7 @@ auto BindRayStep(uint32_t seed) {
         std::vector<uint16_t> result(count * 4);
         form(result.data(), own.data(), row.data(), count, {left.data(), fractions.data()},
              {static_cast<uint16_t>(65535 - brought), brought});
-        std::memcpy(dst, result.data(), count * 8);
+        std::copy_n(reinterpret_cast<const uint8_t*>(result.data()), count * 8, dst);
     };
 }
 
