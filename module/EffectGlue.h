@@ -13,7 +13,6 @@
 #pragma once
 
 #include <cstring>
-#include <new>
 #include <type_traits>
 
 #include "module/HostInterface.h"
@@ -32,8 +31,6 @@ KyvStatus Guard(Body&& body) noexcept {
         } else {
             return body();
         }
-    } catch (const std::bad_alloc&) {
-        return KYV_OUT_OF_MEMORY;
     } catch (...) {
         return KYV_FAIL;
     }

@@ -237,7 +237,8 @@ enum GpuMode {
 };
 
 // EffectContext::cpuLevel: a ceiling for the instruction sets in use. The processor decides
-// within it, and every level gives the same bytes.
+// within it, and every level gives the same bytes, with one exception: at levels 1 and 2 what the
+// fireworks add to an ARGB frame is added to its alpha as well.
 enum CpuLevel {
     CpuLevel_Scalar = 0,
     CpuLevel_Mmx = 1, // 1 and 2

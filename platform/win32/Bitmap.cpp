@@ -2,6 +2,7 @@
 #include "platform/Bitmap.h"
 
 #include <cstdlib>
+#include <cstring>
 
 #include <windows.h>
 
@@ -28,6 +29,10 @@ bool CopyBitmap(BitmapHandle bitmap, CPixelTarget& target) {
     if (!pixels) {
         return false;
     }
+    // What GDI fails to fill must not show what the heap held before.
+    std::memset(pixels, 0,
+                size_t{4} * static_cast<uint32_t>(description.bmWidth) *
+                    static_cast<uint32_t>(description.bmHeight));
     const HDC screen = GetDC(nullptr);
     const HDC memory = CreateCompatibleDC(screen);
     const HGDIOBJ previous = SelectObject(memory, bitmap);
