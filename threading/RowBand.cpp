@@ -42,7 +42,12 @@ void RunRowBands(CThreadPool& pool, uint32_t threads, int32_t rows, JobFunction 
             uint32_t result;
             pool.WaitJob(job.id, kInfinite, &result);
         } else {
-            function(&job.band);
+            // The other bands may be at work on this list, so nothing leaves before they are done.
+            try {
+                function(&job.band);
+            } catch (...) {
+                continue; // as a job's failure is ignored
+            }
         }
     }
 }

@@ -20,7 +20,8 @@ RowBand BandOfRows(void* owner, int32_t index, int32_t count, int32_t rows);
 
 // Splits the rows into one band for every thread that the host grants, at most one a row, and runs
 // the function once for each on the pool with a RowBand as its argument. Returns when all are
-// done; what they return is ignored. A band that the pool cannot take runs on the calling thread.
+// done; what they return or throw is ignored. A band that the pool cannot take runs on the calling
+// thread.
 void RunRowBands(CThreadPool& pool, uint32_t threads, int32_t rows, JobFunction function,
                  void* owner);
 

@@ -10,6 +10,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include "threading/RowBand.h"
 #include "threading/ThreadPool.h"
 
 namespace kyv {
@@ -24,6 +25,7 @@ struct ThreadPoolPeek {
     size_t Queued() const { return Count(pool.m_queued); }
     uint32_t Threads() const { return pool.m_nThreads; }
     uint32_t Limit() const { return pool.m_nMaxThreads; }
+    void RefuseThreads() const { pool.m_nMaxThreads = 0; }
     ThreadPoolWorker* FirstBusy() const { return &pool.m_busy.front(); }
     ThreadPoolWorker* FirstIdle() const { return &pool.m_idle.front(); }
     ThreadPoolJob& NewestQueued() const { return *pool.m_queued.front(); }
@@ -492,6 +494,19 @@ TEST(ThreadPool, RunsEveryJobOfManyOwnersOnceUnderLoad) {
     EXPECT_EQ(pool.ReleaseIdleThreads(), kOk);
     EXPECT_EQ(peek.Threads(), 0U);
     EXPECT_EQ(peek.Exited(), 0U);
+}
+
+// Were it to leave by what a band throws, other bands might still be at work on what it frees.
+TEST(ThreadPool, BandsThatThePoolRefusesMayThrow) {
+    CThreadPool pool;
+    ThreadPoolPeek{pool}.RefuseThreads();
+    int bands = 0;
+    const JobFunction count = [](void* argument) -> uint32_t {
+        ++*static_cast<int*>(static_cast<const RowBand*>(argument)->owner);
+        throw std::runtime_error("a band");
+    };
+    EXPECT_NO_THROW(RunRowBands(pool, 3, 9, count, &bands));
+    EXPECT_EQ(bands, 3);
 }
 
 } // namespace
