@@ -65,11 +65,11 @@ float ResampleFilterLanczos3::Evaluate(float distance) const {
     if (!(t < 3.0F)) {
         return 0.0F;
     }
+    // The order of the operations decides the last bit.
     const float angle = kPi * t;
-    const float wide = t / 3.0F;
     const float first = t == 0.0F ? 1.0F : Sine(angle) / angle;
-    const float wideAngle = kPi * wide;
-    return wide == 0.0F ? first : first * (Sine(wideAngle) / wideAngle);
+    const float wideAngle = angle / 3.0F;
+    return t / 3.0F == 0.0F ? first : first * Sine(wideAngle) / wideAngle;
 }
 
 const ResampleFilter* SelectResampleFilter(int32_t index, const ResampleFilter* otherwise) {
