@@ -203,6 +203,8 @@ void CFreeformPiP::Allocate() {
     if (m_nMapMode == MapMode_Filtered) {
         m_records.clear();
         m_records.resize(pixels * 2);
+        m_pSourceMap.reset();
+        m_mapEntries = 0;
         return;
     }
     m_records.clear();

@@ -312,6 +312,11 @@ TEST(FreeformPiP, OnlyChangesRebuildTheMap) {
         makesDirty([&] { pip.SetFilterIndex(9); });
         makesDirty([&] { pip.SetDestPoints(corners, 2); });
         makesDirty([&] { pip.SetSourcePoints(scene.quad, 1); });
+        EXPECT_NE(pip.SourceMap(), nullptr);
+        makesDirty([&] { pip.SetMapMode(4); });
+        EXPECT_EQ(pip.SourceMap(), nullptr);
+        makesDirty([&] { pip.SetMapMode(2); });
+        EXPECT_NE(pip.SourceMap(), nullptr);
 
         // Another size is another map; the wrong images draw nothing.
         pip.SetSize(40, 30, 20, 60);
