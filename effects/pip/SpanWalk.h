@@ -202,7 +202,8 @@ private:
             Collapse(half.a, half.b, half.top, std::min(half.bottom, y - 1), target, emit);
         }
         if (y >= half.top && y <= half.bottom) {
-            EmitHull(half.a, half.b, y, y, target, emit);
+            const Columns row = Hull(half.a, half.b, y, y);
+            emit(target, row.first, row.last);
         }
         if (y == m_window.bottom) {
             Collapse(half.a, half.b, std::max(half.top, y + 1), half.bottom, target, emit);
@@ -246,10 +247,15 @@ private:
     // Draws the rows top to bottom onto the one row of the window that is nearest to them. Rows in
     // which no side moves by more than a column a step leave no gap between their spans, so their
     // union is known from the first and the last; sides that move faster are through the window
-    // within as many rows as it has columns.
+    // within as many rows as it has columns. Hulls that meet are one span: as sides do not turn
+    // round, what comes after a gap never comes back, and no column is in two spans.
     template <class Emit>
     void Collapse(const CTriangleSide& a, const CTriangleSide& b, int64_t top, int64_t bottom,
                   int32_t target, Emit&& emit) const {
+        if (top > bottom) {
+            return;
+        }
+        Columns pending = Hull(a, b, top, top);
         for (int64_t y = top; y <= bottom;) {
             int64_t end = bottom;
             for (const CTriangleSide* side : {&a, &b}) {
@@ -257,23 +263,31 @@ private:
                     end = LastRowAlike(*side, y, end);
                 }
             }
-            EmitHull(a, b, y, end, target, emit);
+            const Columns hull = Hull(a, b, y, end);
+            if (hull.first > pending.last + 1 || hull.last < pending.first - 1) {
+                emit(target, pending.first, pending.last);
+                pending = hull;
+            } else {
+                pending = {std::min(pending.first, hull.first), std::max(pending.last, hull.last)};
+            }
             y = end + 1;
         }
+        emit(target, pending.first, pending.last);
     }
 
-    template <class Emit>
-    void EmitHull(const CTriangleSide& a, const CTriangleSide& b, int64_t top, int64_t bottom,
-                  int32_t target, Emit&& emit) const {
+    // Both ends inside.
+    struct Columns {
+        int32_t first;
+        int32_t last;
+    };
+
+    Columns Hull(const CTriangleSide& a, const CTriangleSide& b, int64_t top,
+                 int64_t bottom) const {
         const int32_t a0 = Clamp(a.At(top));
         const int32_t b0 = Clamp(b.At(top));
-        if (top == bottom) {
-            emit(target, std::min(a0, b0), std::max(a0, b0));
-            return;
-        }
-        const int32_t a1 = Clamp(a.At(bottom));
-        const int32_t b1 = Clamp(b.At(bottom));
-        emit(target, std::min({a0, b0, a1, b1}), std::max({a0, b0, a1, b1}));
+        const int32_t a1 = top == bottom ? a0 : Clamp(a.At(bottom));
+        const int32_t b1 = top == bottom ? b0 : Clamp(b.At(bottom));
+        return {std::min({a0, b0, a1, b1}), std::max({a0, b0, a1, b1})};
     }
 
     template <class Emit>

@@ -322,4 +322,23 @@ TEST(Rasterizer, DistanceCostsNothing) {
     }
 }
 
+// Rows that end up on one another share pixels by the width of the window each.
+TEST(Rasterizer, RowsBeyondTheWindowCostItsWidthTogether) {
+    for (const int width : {50, 20000, 1 << 20}) {
+        const RasterPoint corners[4] = {{0, 1 - width}, {width, 0}, {0, 0}, {0, 0}};
+        for (const int turn : {1, -1}) { // above the window, below it
+            RasterPoint quad[4];
+            std::transform(corners, corners + 4, quad, [&](RasterPoint p) {
+                return RasterPoint{p.x, p.y * turn};
+            });
+            int64_t pixels = 0;
+            CWindowWalk({0, 0, width - 1, 0}).ClampQuad(quad, [&](int, int first, int last) {
+                pixels += last - first + 1;
+            });
+            EXPECT_GE(pixels, width);
+            EXPECT_LT(pixels, 12 * int64_t{width});
+        }
+    }
+}
+
 } // namespace
