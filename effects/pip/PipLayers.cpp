@@ -245,6 +245,15 @@ RasterPoint Offset(RasterPoint point, RasterPointF normal, float by) {
         {static_cast<float>(point.x) + normal.x * by, static_cast<float>(point.y) + normal.y * by});
 }
 
+// The normal of the nearest side that has length, from one side on forwards (step 1) or backwards
+// (step 3): at a double corner the sides beyond it are those that join.
+const RasterPointF& JoinedNormal(const RasterPointF (&normals)[4], int side, int step) {
+    for (int i = 0; i < 3 && normals[side].x == 0.0F && normals[side].y == 0.0F; ++i) {
+        side = (side + step) % 4;
+    }
+    return normals[side];
+}
+
 template <class Canvas>
 void DrawBorderShapes(Canvas& canvas, const RasterPoint (&quad)[4], int32_t size) {
     const int32_t wholeHalf = size / 2;
@@ -264,8 +273,8 @@ void DrawBorderShapes(Canvas& canvas, const RasterPoint (&quad)[4], int32_t size
     }
     for (int i = 0; i < 4; ++i) {
         // The bands' ends part on the outer side of the turn: to the left of a turn to the right.
-        const RasterPointF& before = normals[(i + 3) % 4];
-        const RasterPointF& after = normals[i];
+        const RasterPointF& before = JoinedNormal(normals, (i + 3) % 4, 3);
+        const RasterPointF& after = JoinedNormal(normals, i, 1);
         const float turn = before.x * after.y - before.y * after.x;
         const float side = turn < 0.0F ? -half : half;
         canvas.Triangle({quad[i], Offset(quad[i], before, side), Offset(quad[i], after, side)});

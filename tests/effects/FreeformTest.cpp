@@ -10,6 +10,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include "effects/pip/PipLayers.h"
 #include "effects/pip/Rasterizer.h"
 #include "imageutility/Conversion.h"
 #include "imageutility/ImageUtility.h"
@@ -310,6 +311,13 @@ private:
             r = r * (x * r * r - 3.0F) * -0.5F;
             normal[i] = {d.y * r, -d.x * r};
         }
+        // A side without length has no normal: the next one that has takes its place in joins.
+        const auto facing = [&](int side, int step) {
+            for (int i = 0; i < 4 && normal[side].x == 0 && normal[side].y == 0; ++i) {
+                side = (side + step + 4) % 4;
+            }
+            return side;
+        };
         const auto moved = [&](int i, int n, float by) {
             return RasterPointF{corner[i].x + normal[n].x * by, corner[i].y + normal[n].y * by};
         };
@@ -319,9 +327,10 @@ private:
                 const RasterPointF a = moved(i, i, h), b = moved(next, i, h),
                                    c = moved(next, i, -h), d = moved(i, i, -h);
                 CRasterizer::FillQuadF(&a, &b, &c, &d);
-                const float turn = normal[before].x * normal[i].y - normal[before].y * normal[i].x;
+                const int in = facing(before, -1), out = facing(i, 1);
+                const float turn = normal[in].x * normal[out].y - normal[in].y * normal[out].x;
                 const float side = turn < 0 ? -h : h;
-                const RasterPointF from = moved(i, before, side), to = moved(i, i, side);
+                const RasterPointF from = moved(i, in, side), to = moved(i, out, side);
                 CRasterizer::FillTriangleF(&corner[i], &from, &to);
                 CRasterizer::FillCircle(m_x[i], m_y[i], size / 2 - 1);
             }
@@ -413,6 +422,11 @@ Params RandomParams(std::mt19937& random, float reach) {
         p.corners[4] = p.corners[2];
         p.corners[6] = p.corners[0];
         p.corners[7] = p.corners[5];
+    }
+    if (random() % 6 == 0) { // a triangle
+        const size_t corner = random() % 4, next = (corner + 1) % 4;
+        p.corners[2 * next] = p.corners[2 * corner];
+        p.corners[2 * next + 1] = p.corners[2 * corner + 1];
     }
     const auto color = [&] { return static_cast<uint32_t>(random()) & 0xFFFFFF; };
     p.key = number(1);
@@ -619,6 +633,33 @@ TEST(Freeform, FramesDoNotDependOnThoseBefore) {
                 EXPECT_EQ(instance.End(), KYV_OK); // and the next frame works all the same
             }
         }
+    }
+}
+
+// A triangle's border is the same whichever of its corners is the double one.
+TEST(Freeform, BordersJoinAtDoubledCorners) {
+    const RasterPoint points[3] = {{30, 30}, {80, 40}, {125, 70}};
+    for (const int32_t level : {0, 3}) {
+        Frame pixels[3]; // a wide border, of which a wide turn leaves some to its wedge alone
+        for (size_t twice = 0; twice < 3; ++twice) {
+            Frame form(160 * 100);
+            CImageARGB image(reinterpret_cast<uint8_t*>(form.data()), 160, 100, 640);
+            image.SetCpuLevel(level);
+            CPipLayer layer;
+            layer.Reset(image, false, 0);
+            layer.Use(layer.Frame());
+            RasterPoint quad[4];
+            for (size_t i = 0; i < 4; ++i) {
+                quad[i] = points[i <= twice ? i : i - 1];
+            }
+            DrawBorder(layer, quad, 40, 0xFFFFFFFF);
+            for (int y = 0; y < 100; ++y) {
+                const auto* row = reinterpret_cast<const uint32_t*>(layer.Image().Row(y));
+                pixels[twice].insert(pixels[twice].end(), row, row + 160);
+            }
+        }
+        EXPECT_EQ(pixels[0], pixels[1]);
+        EXPECT_EQ(pixels[0], pixels[2]);
     }
 }
 
