@@ -282,10 +282,15 @@ private:
             return;
         }
         // With all that a blur will look at.
-        layer.Use(convertsClear ? box.Grown(2 * m_settings.picture.blur) : box);
+        const int32_t margin =
+            convertsClear && m_settings.picture.enabled ? 2 * m_settings.picture.blur : 0;
+        layer.Use(box.Grown(margin));
         m_pip.Render(foreground, layer.Image());
         if (m_settings.key.enabled) {
             layer.ColorKey(m_settings.key.color, m_settings.key.tolerance);
+        }
+        if (convertsClear) {
+            layer.Outdate();
         }
     }
 

@@ -663,6 +663,39 @@ TEST(Freeform, BordersJoinAtDoubledCorners) {
     }
 }
 
+// An AYUV picture that is keyed is no longer clear where it is not covered, which only a blur of a
+// later frame shows.
+TEST(Freeform, KeyedAyuvPicturesLeaveNothingBehind) {
+    constexpr int kWidth = 640, kHeight = 48;
+    const Frame background = RandomFrame(kWidth * kHeight, 1);
+    const Frame foreground = RandomFrame(kWidth * kHeight, 2);
+    Params keyed = PictureOnly(), ringed = keyed, blurred = keyed, bordered = keyed;
+    keyed.key = keyed.border = 1;
+    ringed.key = 1;
+    ringed.picture = 0;
+    ringed.pictureBlur = 4;
+    blurred.pictureBlur = 4;
+    bordered.border = 1;
+    const std::vector<Params> sequences[] = {{keyed, blurred}, {ringed, bordered, blurred}};
+    for (const auto& sequence : sequences) {
+        for (const int32_t level : {0, 3}) {
+            CTestInstance instance(Pip(), kWidth, kHeight);
+            instance.Context().cpuLevel = level;
+            instance.Context().pixelFormat = PixelFormat_Ayuv;
+            ASSERT_EQ(instance.Begin(), KYV_OK);
+            for (const Params& params : sequence) {
+                Store(params, instance);
+                Frame output(background.size());
+                ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()),
+                          KYV_OK);
+                EXPECT_EQ(output, RenderEffect(params, background, foreground, kWidth, kHeight,
+                                               PixelFormat_Ayuv, level))
+                    << (&params - sequence.data()) << " at level " << level;
+            }
+        }
+    }
+}
+
 TEST(Freeform, InstancesOnSeveralThreadsAreIndependent) {
     std::vector<std::thread> threads;
     for (uint32_t seed = 0; seed < 4; ++seed) {
