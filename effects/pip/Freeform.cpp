@@ -275,6 +275,10 @@ private:
         const bool convertsClear = m_ayuv && m_settings.key.enabled;
         // Through the same map the same pixels are drawn again, and the others are still clear.
         if (m_pip.IsDirty() || convertsClear || !layer.Fits(foreground, m_ayuv)) {
+            // Beyond its box a quad is drawn outside the part in use.
+            if (std::max(layer.Frame().right, layer.Frame().bottom) > kFarthestInBox) {
+                layer.Use(layer.Frame());
+            }
             layer.Reset(foreground, m_ayuv, 0);
         }
         const PixelBox box = PictureBox(Frame());

@@ -13,7 +13,7 @@ CPictureRows::CPictureRows(int32_t width, const PixelBox& box, const PictureKey&
 
 uint8_t* CPictureRows::Row(int32_t y) {
     // The row above this one is complete, but it may still be looked at.
-    while (m_nNext < y - 1) {
+    while (m_nNext < std::min(y - 1, m_box.bottom)) {
         FinishRow();
     }
     return reinterpret_cast<uint8_t*>(Slot(y));

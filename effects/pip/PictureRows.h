@@ -30,7 +30,8 @@ protected:
 };
 
 // A target for CFreeformPiP::RenderRows whose rows come from top to bottom, in a frame of the given
-// width. The result is the same as that of a layer and its ColorKey.
+// width. What is drawn below the box is dropped. The result is the same as that of a layer and its
+// ColorKey.
 class CPictureRows final : public CRowTarget {
 public:
     CPictureRows(int32_t width, const PixelBox& box, const PictureKey& key, bool ayuv,

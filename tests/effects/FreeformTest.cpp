@@ -696,6 +696,45 @@ TEST(Freeform, KeyedAyuvPicturesLeaveNothingBehind) {
     }
 }
 
+// The bounding box ends at 99999, the quad does not.
+TEST(Freeform, FramesBeyondTheBoxAreDrawnUpToItsEnd) {
+    for (const auto& [width, height] : {std::pair(3, 110000), std::pair(110000, 3)}) {
+        const auto pixels = static_cast<size_t>(width * height);
+        const Frame background = RandomFrame(pixels, 1), foreground = RandomFrame(pixels, 2);
+        const float right = width > height ? 0.909086F : 1.0F; // column 99999
+        const float bottom = width > height ? 1.0F : 0.909086F;
+        Params whole = PictureOnly(), layered, blurred = whole;
+        const float all[8] = {0, 0, 1, 0, 1, 1, 0, 1};
+        const float boxed[8] = {0, 0, right, 0, right, bottom, 0, bottom};
+        std::copy(all, all + 8, whole.corners);
+        std::copy(boxed, boxed + 8, blurred.corners);
+        blurred.pictureBlur = 1;
+        layered = whole;
+        layered.border = 1;
+        const Frame expected = RenderEffect(whole, background, foreground, width, height, 0, 0);
+        EXPECT_NE(expected, background);
+        for (const int32_t level : {0, 5}) {
+            CTestInstance instance(Pip(), static_cast<uint32_t>(width),
+                                   static_cast<uint32_t>(height));
+            instance.Context().cpuLevel = level;
+            ASSERT_EQ(instance.Begin(), KYV_OK);
+            Store(whole, instance);
+            Frame output = background; // in place, where nothing that is drawn twice is put right
+            ASSERT_EQ(instance.Render(output.data(), output.data(), foreground.data()), KYV_OK);
+            EXPECT_TRUE(output == expected) << width << " wide, level " << level;
+            // A blur looks beyond the end, to where the quad of a frame before has been.
+            for (const Params& params : {layered, blurred}) {
+                Store(params, instance);
+                ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()),
+                          KYV_OK);
+            }
+            EXPECT_TRUE(output ==
+                        RenderEffect(blurred, background, foreground, width, height, 0, level))
+                << width << " wide, blurred, level " << level;
+        }
+    }
+}
+
 TEST(Freeform, InstancesOnSeveralThreadsAreIndependent) {
     std::vector<std::thread> threads;
     for (uint32_t seed = 0; seed < 4; ++seed) {
