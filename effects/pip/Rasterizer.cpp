@@ -98,9 +98,6 @@ void CRasterizer::FillTriangle(const RasterPoint* a, const RasterPoint* b, const
 
 void CRasterizer::FillQuad(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c,
                            const RasterPoint* d) {
-    if (!a || !b || !c || !d) {
-        return;
-    }
     FillTriangle(a, b, c);
     FillTriangle(a, c, d);
 }

@@ -73,7 +73,7 @@ public:
     // stays below 2^31; beyond, the products wrap.
     static void FillTriangle(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c);
 
-    // The triangles ABC and ACD. Nothing if a pointer is null.
+    // The triangles ABC and ACD, each only when all three of its points are there.
     static void FillQuad(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c,
                          const RasterPoint* d);
 
@@ -81,7 +81,7 @@ public:
     // those that are not a number to 0.
     static void FillTriangleF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c);
 
-    // The triangles ABC and ACD, each only when all three of its points are there.
+    // FillQuad of points that are truncated like those of FillTriangleF.
     static void FillQuadF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c,
                           const RasterPointF* d);
 

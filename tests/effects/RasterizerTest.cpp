@@ -162,7 +162,10 @@ TEST(Rasterizer, QuadsEmitTheDiagonalTwice) {
     EXPECT_THAT(
         Emitted([&] { CRasterizer::FillQuad(&a, &b, &c, &d); }),
         ElementsAre(Pair(0, 0), Pair(1, 0), Pair(1, 1), Pair(0, 0), Pair(0, 1), Pair(1, 1)));
-    EXPECT_THAT(Emitted([&] { CRasterizer::FillQuad(&a, &b, &c, nullptr); }), IsEmpty());
+    EXPECT_EQ(Emitted([&] { CRasterizer::FillQuad(&a, &b, &c, nullptr); }), Triangle(a, b, c));
+    EXPECT_EQ(Emitted([&] { CRasterizer::FillQuad(&a, nullptr, &c, &d); }), Triangle(a, c, d));
+    EXPECT_THAT(Emitted([&] { CRasterizer::FillQuad(&a, &b, nullptr, &d); }), IsEmpty());
+    EXPECT_THAT(Emitted([&] { CRasterizer::FillQuad(nullptr, &b, &c, &d); }), IsEmpty());
 }
 
 TEST(Rasterizer, FloatPointsAreTruncatedAndMayBeMissing) {
