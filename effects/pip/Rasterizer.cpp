@@ -8,27 +8,63 @@ namespace {
 
 RasterPixelCallback g_callback = nullptr;
 
-// The callback is read afresh for every pixel: it may replace itself.
-void Emit(RasterPixel& pixel, int64_t x, int64_t y) {
-    if (g_callback) {
-        pixel.x = static_cast<int32_t>(x);
-        pixel.y = static_cast<int32_t>(y);
-        g_callback(&pixel);
-    }
-}
-
-// A fresh record for every pixel: the callback may not change the next one.
-void Plot(int64_t x, int64_t y) {
-    RasterPixel pixel = {};
-    Emit(pixel, x, y);
-}
-
-void EmitTriangleSpan(const RasterPoint (&vertices)[3], int32_t y, int32_t first, int32_t last) {
-    for (int64_t x = first; x <= last; ++x) {
-        RasterPixel pixel = {0, 0, {}, {vertices[0], vertices[1], vertices[2]}};
+// What a primitive draws with: the callback that it found, to which it keeps when the callback
+// installs another. Every pixel has a fresh record, so that the callback does not change the next
+// one.
+class CPen {
+public:
+    void Plot(int64_t x, int64_t y) const {
+        RasterPixel pixel = {};
         Emit(pixel, x, y);
     }
-}
+
+    auto TriangleFiller(const RasterPoint (&vertices)[3]) const {
+        return [this, &vertices](int32_t y, int32_t first, int32_t last) {
+            for (int64_t x = first; x <= last; ++x) {
+                RasterPixel pixel = {0, 0, {}, {vertices[0], vertices[1], vertices[2]}};
+                Emit(pixel, x, y);
+            }
+        };
+    }
+
+    void FillTriangle(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c) const {
+        if (a && b && c) {
+            const RasterPoint vertices[3] = {*a, *b, *c};
+            WalkTriangle(vertices, TriangleFiller(vertices));
+        }
+    }
+
+    void FillTriangle(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c) const {
+        if (a && b && c) {
+            const RasterPoint vertices[3] = {Truncate(*a), Truncate(*b), Truncate(*c)};
+            WalkTriangle(vertices, TriangleFiller(vertices));
+        }
+    }
+
+    // (+-u, +-v) about the centre.
+    void PlotFourWay(int64_t x, int64_t y, int64_t u, int64_t v) const {
+        Plot(x + u, y + v);
+        Plot(x - u, y + v);
+        Plot(x + u, y - v);
+        Plot(x - u, y - v);
+    }
+
+    void PlotEightWay(int64_t x, int64_t y, int64_t u, int64_t v) const {
+        PlotFourWay(x, y, u, v);
+        PlotFourWay(x, y, v, u);
+    }
+
+private:
+    void Emit(RasterPixel& pixel, int64_t x, int64_t y) const {
+        if (m_callback) {
+            pixel.x = static_cast<int32_t>(x);
+            pixel.y = static_cast<int32_t>(y);
+            m_callback(&pixel);
+        }
+    }
+
+    const RasterPixelCallback m_callback = g_callback;
+};
 
 } // namespace
 
@@ -46,10 +82,11 @@ void CRasterizer::SetPixelCallback(RasterPixelCallback callback) {
 }
 
 void CRasterizer::PlotPixel(int32_t x, int32_t y) {
-    Plot(x, y);
+    CPen().Plot(x, y);
 }
 
 void CRasterizer::DrawLine(int32_t x0, int32_t y0, int32_t x1, int32_t y1) {
+    const CPen pen;
     int64_t x = x0;
     int64_t y = y0;
     const int64_t dx = std::abs(int64_t{x1} - x0);
@@ -58,7 +95,7 @@ void CRasterizer::DrawLine(int32_t x0, int32_t y0, int32_t x1, int32_t y1) {
     const int64_t stepY = y1 < y0 ? -1 : 1;
     if (dx < dy) {
         for (int64_t error = 2 * dx - dy; y != y1; y += stepY, error += 2 * dx) {
-            Plot(x, y);
+            pen.Plot(x, y);
             if (error >= 0) {
                 x += stepX;
                 error -= 2 * dy;
@@ -66,102 +103,88 @@ void CRasterizer::DrawLine(int32_t x0, int32_t y0, int32_t x1, int32_t y1) {
         }
     } else {
         for (int64_t error = 2 * dy - dx; x != x1; x += stepX, error += 2 * dy) {
-            Plot(x, y);
+            pen.Plot(x, y);
             if (error >= 0) {
                 y += stepY;
                 error -= 2 * dx;
             }
         }
     }
-    Plot(x, y);
+    pen.Plot(x, y);
 }
 
 void CRasterizer::FillCircle(int32_t centreX, int32_t centreY, int32_t radius) {
+    const CPen pen;
     WalkCircle({centreX, centreY}, radius,
-               [](int64_t below, int64_t above, int64_t first, int64_t last) {
+               [&](int64_t below, int64_t above, int64_t first, int64_t last) {
                    for (int64_t x = first; x <= last; ++x) {
-                       Plot(x, below);
-                       Plot(x, above);
+                       pen.Plot(x, below);
+                       pen.Plot(x, above);
                    }
                });
 }
 
 void CRasterizer::FillTriangle(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c) {
-    if (!a || !b || !c) {
-        return;
-    }
-    const RasterPoint vertices[3] = {*a, *b, *c};
-    WalkTriangle(vertices, [&](int32_t y, int32_t first, int32_t last) {
-        EmitTriangleSpan(vertices, y, first, last);
-    });
+    CPen().FillTriangle(a, b, c);
 }
 
 void CRasterizer::FillQuad(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c,
                            const RasterPoint* d) {
-    FillTriangle(a, b, c);
-    FillTriangle(a, c, d);
+    const CPen pen;
+    pen.FillTriangle(a, b, c);
+    pen.FillTriangle(a, c, d);
 }
 
 void CRasterizer::FillTriangleF(const RasterPointF* a, const RasterPointF* b,
                                 const RasterPointF* c) {
-    if (!a || !b || !c) {
-        return;
-    }
-    const RasterPoint vertices[3] = {Truncate(*a), Truncate(*b), Truncate(*c)};
-    FillTriangle(&vertices[0], &vertices[1], &vertices[2]);
+    CPen().FillTriangle(a, b, c);
 }
 
 void CRasterizer::FillQuadF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c,
                             const RasterPointF* d) {
-    FillTriangleF(a, b, c);
-    FillTriangleF(a, c, d);
+    const CPen pen;
+    pen.FillTriangle(a, b, c);
+    pen.FillTriangle(a, c, d);
 }
 
 void CRasterizer::FillQuadWithin(const RasterWindow& window, const RasterPoint (&quad)[4]) {
+    const CPen pen;
     const CWindowWalk walk(window);
     for (const int third : {2, 3}) {
         const RasterPoint vertices[3] = {quad[0], quad[third - 1], quad[third]};
-        walk.ClampTriangle(vertices, [&](int32_t y, int32_t first, int32_t last) {
-            EmitTriangleSpan(vertices, y, first, last);
-        });
+        walk.ClampTriangle(vertices, pen.TriangleFiller(vertices));
     }
 }
 
 void CRasterizer::FillTriangleInside(const RasterWindow& window, const RasterPoint (&triangle)[3]) {
-    CWindowWalk(window).ClipTriangle(triangle, [&](int32_t y, int32_t first, int32_t last) {
-        EmitTriangleSpan(triangle, y, first, last);
-    });
+    const CPen pen;
+    CWindowWalk(window).ClipTriangle(triangle, pen.TriangleFiller(triangle));
 }
 
 void CRasterizer::FillCircleInside(const RasterWindow& window, RasterPoint centre, int32_t radius) {
-    CWindowWalk(window).ClipCircle(centre, radius, [](int32_t y, int32_t first, int32_t last) {
+    const CPen pen;
+    CWindowWalk(window).ClipCircle(centre, radius, [&](int32_t y, int32_t first, int32_t last) {
         for (int32_t x = first; x <= last; ++x) {
-            Plot(x, y);
+            pen.Plot(x, y);
         }
     });
 }
 
 void CRasterizer::PlotEightWay(int32_t centreX, int32_t centreY, int32_t u, int32_t v) {
-    const int64_t x = centreX;
-    const int64_t y = centreY;
-    for (const auto& [dx, dy] : {RasterPoint{u, v}, RasterPoint{v, u}}) {
-        Plot(x + dx, y + dy);
-        Plot(x - dx, y + dy);
-        Plot(x + dx, y - dy);
-        Plot(x - dx, y - dy);
-    }
+    CPen().PlotEightWay(centreX, centreY, u, v);
 }
 
 void CRasterizer::DrawCircle(int32_t centreX, int32_t centreY, int32_t radius) {
     if (radius < 0) {
         return;
     }
+    const CPen pen;
     // The same decisions as the disc's, so that the outline is its rim.
     int64_t u = 0;
     int64_t v = radius;
     int64_t decision = 3 - 2 * v;
     for (; u <= v; ++u) {
-        PlotEightWay(centreX, centreY, static_cast<int32_t>(u), static_cast<int32_t>(v));
+        pen.PlotEightWay(centreX, centreY, u, v);
         if (decision >= 0) {
             decision += 4 * (u - v) + 10;
             --v;
@@ -178,12 +201,7 @@ void CRasterizer::DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX,
     }
     const int64_t a2 = int64_t{radiusX} * radiusX;
     const int64_t b2 = int64_t{radiusY} * radiusY;
-    const auto plot = [&](int64_t u, int64_t v) {
-        Plot(centreX + u, centreY + v);
-        Plot(centreX - u, centreY + v);
-        Plot(centreX + u, centreY - v);
-        Plot(centreX - u, centreY - v);
-    };
+    const CPen pen;
     // From the left end to the top: error is b2 x^2 + a2 y^2 - a2 b2 at the point one step further
     // along both axes, which says which of the two steps comes nearer to the curve.
     int64_t x = -int64_t{radiusX};
@@ -192,7 +210,7 @@ void CRasterizer::DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX,
     int64_t stepY = a2;
     int64_t error = stepX + stepY;
     while (x <= 0) {
-        plot(x, y);
+        pen.PlotFourWay(centreX, centreY, x, y);
         const int64_t twice = 2 * error;
         if (twice >= stepX) {
             ++x;
@@ -207,8 +225,8 @@ void CRasterizer::DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX,
     }
     // A flat ellipse reaches its middle before its top.
     for (; y < radiusY; ++y) {
-        Plot(centreX, centreY + y + 1);
-        Plot(centreX, centreY - y - 1);
+        pen.Plot(centreX, centreY + y + 1);
+        pen.Plot(centreX, centreY - y - 1);
     }
 }
 

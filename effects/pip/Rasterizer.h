@@ -5,10 +5,11 @@
 // primitives emit a pixel twice. What a pixel means is the receiver's affair; it must put up with
 // repeats.
 //
-// Every primitive hands its pixels to the one callback of the process, which is null at first and
-// stays until it is replaced. Without one nothing is emitted. The callback is not guarded: whoever
-// draws through it holds CRasterLock meanwhile. Code that wants whole spans, and no state shared by
-// the process, takes them from effects/pip/SpanWalk.h, on which the primitives stand.
+// Every primitive hands all its pixels to the one callback that the process has when the primitive
+// is called. It is null at first and stays until it is replaced; without one nothing is emitted.
+// The callback is not guarded: whoever draws through it holds CRasterLock meanwhile. Code that
+// wants whole spans, and no state shared by the process, takes them from effects/pip/SpanWalk.h, on
+// which the primitives stand.
 #pragma once
 
 #include <cstdint>

@@ -168,6 +168,30 @@ TEST(Rasterizer, QuadsEmitTheDiagonalTwice) {
     EXPECT_THAT(Emitted([&] { CRasterizer::FillQuad(nullptr, &b, &c, &d); }), IsEmpty());
 }
 
+// A callback that is installed in the middle of a primitive waits for the next one.
+TEST(Rasterizer, PrimitivesKeepTheCallbackTheyStartedWith) {
+    static int first, second;
+    first = second = 0;
+    const auto install = [] {
+        CRasterizer::SetPixelCallback([](const RasterPixel*) {
+            ++first;
+            CRasterizer::SetPixelCallback([](const RasterPixel*) { ++second; });
+        });
+    };
+    const RasterPoint a = {0, 0}, b = {1, 0}, c = {1, 1}, d = {0, 1};
+    install();
+    CRasterizer::FillQuad(&a, &b, &c, &d);
+    EXPECT_EQ(first, 6);
+    EXPECT_EQ(second, 0);
+    CRasterizer::DrawLine(0, 0, 3, 1);
+    EXPECT_EQ(second, 4);
+    install();
+    CRasterizer::FillCircle(0, 0, 1);
+    EXPECT_EQ(first, 14);
+    EXPECT_EQ(second, 4);
+    CRasterizer::SetPixelCallback(nullptr);
+}
+
 TEST(Rasterizer, FloatPointsAreTruncatedAndMayBeMissing) {
     const RasterPointF a = {-0.7F, -0.7F}, b = {2.9F, 0.9F}, c = {2.1F, 1.9F}, d = {-0.9F, 1.9F};
     const RasterPoint ia = {0, 0}, ib = {2, 0}, ic = {2, 1}, id = {0, 1};
