@@ -14,7 +14,8 @@
 
 namespace kyv {
 
-// The work images, kept from frame to frame; those of a layer that is off have no pixels.
+// The work images, kept from frame to frame; those of a layer that has never been on have no
+// pixels.
 class CPipWork {
 public:
     CPipLayer picture;
@@ -173,7 +174,8 @@ private:
     uint8_t m_alpha = 0;
 };
 
-// One frame's work. What is drawn is the same as if every pass went over the whole frame.
+// One frame's work. What is drawn is the same as if every pass went over the whole frame, but for a
+// picture whose box lies outside the frame: it is left out, although its quad marks the edge.
 class CFrameWork {
 public:
     CFrameWork(const Settings& settings, CFreeformPiP& pip, CPipWork& work, bool ayuv)

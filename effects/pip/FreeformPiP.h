@@ -76,8 +76,9 @@ public:
 
     // Draws the picture's quad, at the destination's level. The map is that of the position moved
     // to the nearest one in the frame, and so are the pixels drawn: a quad that lies outside marks
-    // the frame's edge. Returns 0, with nothing drawn, without a size or when an image has no
-    // pixels or another size, else 1. Throws std::bad_alloc. The images must not overlap.
+    // the frame's edge. Whoever wants nothing of such a quad does not call. Returns 0, with nothing
+    // drawn, without a size or when an image has no pixels or another size, else 1. Throws
+    // std::bad_alloc. The images must not overlap.
     int32_t Render(const KYVImageUtility::CImageARGB& source,
                    KYVImageUtility::CImageARGB& destination);
 

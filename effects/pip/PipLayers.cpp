@@ -162,8 +162,6 @@ void CPipLayer::BlendRow(uint8_t* frameRow, int32_t y, uint8_t opacity) const {
     }
 }
 
-// ------------------------------------------------------------------------------------- the border
-
 namespace {
 
 // What the pixel callback draws on; under CRasterLock.

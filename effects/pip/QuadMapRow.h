@@ -59,7 +59,7 @@ struct QuadCoordinates {
 // of a quad without area, counts as 0.
 QuadCoordinates SolveQuad(const QuadMapRowPlan& plan, double x);
 
-// A position in pixels as an entry's 16 bits. Within +-2^25.
+// A position in pixels as an entry's 16 bits. Below +-2^25.
 inline uint32_t MapValue(double position) {
     return static_cast<uint32_t>(static_cast<int32_t>(position * 64.0)) & 0xFFFF;
 }

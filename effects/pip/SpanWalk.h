@@ -97,8 +97,6 @@ void WalkCircle(RasterPoint centre, int32_t radius, Emit&& emit) {
     }
 }
 
-// ---------------------------------------------------------------------------- walks over a window
-
 // One side of a triangle: the column in every row, rising or falling all the way down.
 class CTriangleSide {
 public:

@@ -82,8 +82,6 @@ void Store(const Params& p, CTestInstance& instance) {
     instance.Set("P29", p.borderBlur);
 }
 
-// ---------------------------------------------------------------------------------- the slow form
-
 struct Bounds {
     int left, top, right, bottom; // inside
 
