@@ -293,7 +293,7 @@ private:
         layer.Use(box.Grown(margin));
         m_pip.Render(foreground, layer.Image());
         if (m_settings.key.enabled) {
-            layer.ColorKey(m_settings.key.color, m_settings.key.tolerance);
+            layer.ColorKey(m_settings.key);
         }
         if (convertsClear) {
             layer.Outdate();

@@ -7,9 +7,8 @@ namespace kyv {
 
 CPictureRows::CPictureRows(int32_t width, const PixelBox& box, const PictureKey& key, bool ayuv,
                            int32_t cpuLevel, CRowSink& sink)
-    : m_width(static_cast<size_t>(width)), m_box(box), m_key(key), m_bAyuv(ayuv), m_sink(sink),
-      m_pKeyRow(kColorKeyRow.For(Resolve(cpuLevel))), m_pToArgb(kToARGB.For(Resolve(cpuLevel))),
-      m_pToAyuv(kToAYUV.For(Resolve(cpuLevel))), m_rows(2 * m_width), m_nNext(box.top) {}
+    : m_width(static_cast<size_t>(width)), m_box(box), m_bKeyed(key.enabled),
+      m_key(key, ayuv, cpuLevel), m_sink(sink), m_rows(2 * m_width), m_nNext(box.top) {}
 
 uint8_t* CPictureRows::Row(int32_t y) {
     // The row above this one is complete, but it may still be looked at.
@@ -29,19 +28,8 @@ void CPictureRows::FinishRow() {
     const int32_t y = m_nNext++;
     const auto count = static_cast<size_t>(m_box.Width());
     uint8_t* row = Pixels(y);
-    if (m_key.enabled) {
-        const bool last = y + 1 == m_box.bottom;
-        uint8_t* below = last ? row : Pixels(y + 1);
-        if (m_bAyuv && y == m_box.top) {
-            m_pToArgb(row, row, count);
-        }
-        if (m_bAyuv && !last) {
-            m_pToArgb(below, below, count);
-        }
-        m_pKeyRow(row, below, count, m_key.color, m_key.tolerance);
-        if (m_bAyuv) {
-            m_pToAyuv(row, row, count);
-        }
+    if (m_bKeyed) {
+        m_key.KeyRow(row, y + 1 < m_box.bottom ? Pixels(y + 1) : nullptr, count);
     }
     m_sink.Take(y, row);
     std::fill_n(Slot(y) + m_box.left, count, 0);

@@ -5,19 +5,11 @@
 #include <cstdint>
 #include <vector>
 
+#include "effects/pip/ColorKeyPass.h"
 #include "effects/pip/FreeformPiP.h"
-#include "effects/pip/LayerRows.h"
 #include "effects/pip/PipLayers.h"
-#include "imageutility/kernels/ToARGB.h"
-#include "imageutility/kernels/ToAYUV.h"
 
 namespace kyv {
-
-struct PictureKey {
-    bool enabled;
-    uint32_t color; // 0x00RRGGBB
-    uint8_t tolerance;
-};
 
 // Receives finished rows of the box, all of them, top to bottom.
 class CRowSink {
@@ -49,12 +41,9 @@ private:
 
     size_t m_width;
     PixelBox m_box;
-    PictureKey m_key;
-    bool m_bAyuv;
+    bool m_bKeyed;
+    CColorKeyPass m_key;
     CRowSink& m_sink;
-    ColorKeyRow m_pKeyRow;
-    ToARGBRow m_pToArgb;
-    ToAYUVRow m_pToAyuv;
     // Two rows in turn: the next to be finished and the one below it. Rows that have not been drawn
     // on are clear.
     std::vector<uint32_t> m_rows;

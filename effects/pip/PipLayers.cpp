@@ -6,8 +6,6 @@
 
 #include "effects/pip/LayerRows.h"
 #include "effects/pip/SpanWalk.h"
-#include "imageutility/kernels/ToARGB.h"
-#include "imageutility/kernels/ToAYUV.h"
 #include "platform/CpuFeatures.h"
 
 namespace kyv {
@@ -108,29 +106,15 @@ void CPipLayer::Gradient(const PixelBox& rectangle, int32_t direction, const Lay
     }
 }
 
-void CPipLayer::ColorKey(uint32_t key, uint8_t tolerance) {
+void CPipLayer::ColorKey(const PictureKey& key) {
     if (m_used.IsEmpty()) {
         return;
     }
+    CColorKeyPass pass(key, m_bAyuv, m_image.GetCpuLevel());
     const auto count = static_cast<size_t>(m_used.Width());
-    const ColorKeyRow keyRow = FormFor(kColorKeyRow, m_image);
-    const ToARGBRow toArgb = FormFor(kToARGB, m_image);
-    const ToAYUVRow toAyuv = FormFor(kToAYUV, m_image);
-    // A row is keyed when the one below is in RGB too.
-    if (m_bAyuv) {
-        uint8_t* row = At(m_image, m_used.left, m_used.top);
-        toArgb(row, row, count);
-    }
     for (int32_t y = m_used.top; y < m_used.bottom; ++y) {
         uint8_t* row = At(m_image, m_used.left, y);
-        uint8_t* below = y + 1 < m_used.bottom ? row + m_image.GetPitch() : row;
-        if (m_bAyuv && below != row) {
-            toArgb(below, below, count);
-        }
-        keyRow(row, below, count, key, tolerance);
-        if (m_bAyuv) {
-            toAyuv(row, row, count);
-        }
+        pass.KeyRow(row, y + 1 < m_used.bottom ? row + m_image.GetPitch() : nullptr, count);
     }
 }
 

@@ -8,6 +8,7 @@
 #include <cstdint>
 #include <vector>
 
+#include "effects/pip/ColorKeyPass.h"
 #include "effects/pip/Rasterizer.h"
 #include "imageutility/ImageUtility.h"
 #include "imageutility/kernels/AlphaBlend.h"
@@ -83,9 +84,8 @@ public:
     void Gradient(const PixelBox& rectangle, int32_t direction, const LayerColor& first,
                   const LayerColor& second);
 
-    // Keys a colour (0x00RRGGBB) out of the part in use. An AYUV layer is converted for it and
-    // back.
-    void ColorKey(uint32_t key, uint8_t tolerance);
+    // Keys a colour out of the part in use. An AYUV layer is converted for it and back.
+    void ColorKey(const PictureKey& key);
 
     // The box blur of all four channels over the frame, worked out where it can be anything but
     // clear. `content` is the part within which pixels are covered.

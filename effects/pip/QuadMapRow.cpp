@@ -24,9 +24,7 @@ QuadCoordinates SolveQuad(const QuadMapRowPlan& plan, double x) {
 
 void QuadMapRow_scalar(uint32_t* map, int32_t x, size_t count, const QuadMapRowPlan& plan) {
     for (size_t i = 0; i < count; ++i) {
-        const QuadCoordinates p = SolveQuad(plan, x + static_cast<double>(i));
-        map[i] = MapValue(plan.originU + p.s * plan.rangeU) |
-                 MapValue(plan.originV + p.t * plan.rangeV) << 16;
+        map[i] = MapEntry(plan, x + static_cast<double>(i));
     }
 }
 

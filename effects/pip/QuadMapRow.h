@@ -59,9 +59,18 @@ struct QuadCoordinates {
 // of a quad without area, counts as 0.
 QuadCoordinates SolveQuad(const QuadMapRowPlan& plan, double x);
 
-// A position in pixels as an entry's 16 bits. Below +-2^25.
-inline uint32_t MapValue(double position) {
-    return static_cast<uint32_t>(static_cast<int32_t>(position * 64.0)) & 0xFFFF;
+// The entry of a position in pixels, both coordinates below +-2^25.
+inline uint32_t MapEntry(double u, double v) {
+    const auto value = [](double position) {
+        return static_cast<uint32_t>(static_cast<int32_t>(position * 64.0)) & 0xFFFF;
+    };
+    return value(u) | value(v) << 16;
+}
+
+// The entry of column x.
+inline uint32_t MapEntry(const QuadMapRowPlan& plan, double x) {
+    const QuadCoordinates p = SolveQuad(plan, x);
+    return MapEntry(plan.originU + p.s * plan.rangeU, plan.originV + p.t * plan.rangeV);
 }
 
 } // namespace kyv

@@ -58,10 +58,7 @@ QuadMapRowPlan CQuadModel::PlanRow(double y) const {
 }
 
 uint32_t CQuadModel::InverseBilinearEntry(double x, double y) const {
-    const QuadMapRowPlan plan = PlanRow(y);
-    const QuadCoordinates p = SolveQuad(plan, x);
-    return MapValue(plan.originU + p.s * plan.rangeU) | MapValue(plan.originV + p.t * plan.rangeV)
-                                                            << 16;
+    return MapEntry(PlanRow(y), x);
 }
 
 QuadPoint CQuadModel::InverseBilinearPoint(double x, double y) const {
@@ -107,7 +104,7 @@ QuadPoint CQuadModel::WachspressPoint(double x, double y) const {
 
 uint32_t CQuadModel::WachspressEntry(double x, double y) const {
     const QuadPoint point = WachspressPoint(x, y);
-    return point.inside ? MapValue(point.u) | MapValue(point.v) << 16 : kOutside;
+    return point.inside ? MapEntry(point.u, point.v) : kOutside;
 }
 
 // The line of constant t through the point is |e + t g| long, and that of constant s |f + s g|.
