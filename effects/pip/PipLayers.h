@@ -60,7 +60,7 @@ public:
     // True when the layer has that form already and shows nothing but what has been drawn since it
     // was cleared: to draw at the same places again then needs no clearing before.
     bool Fits(const KYVImageUtility::CImageARGB& frame, bool ayuv) const;
-    // The places have changed without a drawing.
+    // The places have changed without a drawing, or what is not covered is no longer clear.
     void Outdate() { m_bFresh = false; }
 
     KYVImageUtility::CImageARGB& Image() { return m_image; }
