@@ -3,7 +3,7 @@
 
 #include <algorithm>
 #include <cstring>
-#include <vector>
+#include <new>
 
 #include "effects/transition/MaskBlend.h"
 #include "imageutility/Bitmap.h"
@@ -73,26 +73,32 @@ struct BlendJob {
     MaskBlendRow row;
     MaskBlend blend;
 
-    static uint32_t RunBand(void* argument) {
+    static uint32_t RunBand(void* argument) noexcept {
         const auto* band = static_cast<const RowBand*>(argument);
         static_cast<const BlendJob*>(band->owner)->BlendRows(band->firstRow, band->endRow);
         return kOk;
     }
 
     // Where the frame is larger than the mask, the mask's last column and row go on.
-    void BlendRows(int32_t first, int32_t end) const {
+    void BlendRows(int32_t first, int32_t end) const noexcept {
         const auto width = static_cast<size_t>(output.GetWidth());
         const auto known = std::min(width, static_cast<size_t>(mask.GetWidth()));
-        std::vector<uint8_t> widened(known < width ? width : 0);
+        uint8_t beyond[256];
         for (int32_t y = first; y < end; ++y) {
             const uint8_t* values = mask.Row(std::min(y, mask.GetHeight() - 1));
+            BlendPart(y, 0, known, values);
             if (known < width) {
-                std::memcpy(widened.data(), values, known);
-                std::memset(widened.data() + known, values[known - 1], width - known);
-                values = widened.data();
+                std::memset(beyond, values[known - 1], sizeof beyond);
             }
-            row(output.Row(y), picture0.Row(y), picture1.Row(y), values, width, blend);
+            for (size_t x = known; x < width; x += sizeof beyond) {
+                BlendPart(y, x, std::min(width - x, sizeof beyond), beyond);
+            }
         }
+    }
+
+    void BlendPart(int32_t y, size_t x, size_t count, const uint8_t* values) const noexcept {
+        const size_t at = x * 4;
+        row(output.Row(y) + at, picture0.Row(y) + at, picture1.Row(y) + at, values, count, blend);
     }
 };
 

@@ -403,7 +403,7 @@ TEST_P(Transition, FrameLargerThanTheMaskStaysInside) {
     ASSERT_EQ(instance.Begin(), KYV_OK);
     Apply(instance, {.percentage = 0.5F});
     const Mask mask = FitMask(GetParam(), 8, 6);
-    for (const auto& [width, height] : {std::pair{50U, 40U}, {1U, 1U}, {7U, 3U}}) {
+    for (const auto& [width, height] : {std::pair{50U, 40U}, {1U, 1U}, {7U, 3U}, {777U, 9U}}) {
         const Frame a = RandomFrame(size_t{width} * height, 13);
         const Frame b = RandomFrame(a.size(), 14);
         Frame expected(a.size());
