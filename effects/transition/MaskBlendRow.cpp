@@ -5,7 +5,7 @@
 
 namespace kyv {
 
-const KernelTable<MaskBlendRow> kMaskBlendRow = {
+constinit const KernelTable<MaskBlendRow> kMaskBlendRow = {
     .scalar = MaskBlendRow_scalar,
     .sse2 = KYV_VECTOR_FORM(MaskBlendRow_sse2),
     .avx2 = KYV_VECTOR_FORM(MaskBlendRow_avx2),

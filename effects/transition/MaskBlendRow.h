@@ -11,10 +11,9 @@ namespace kyv {
 // What becomes of a pixel, by the mask's value there. Four equal or four different factors a value,
 // in the order of the pixel's bytes, so that vector forms load them as they are.
 //
-// x = (picture1 * w + picture0 * (255 - w)) >> 8 for weights 1..254; the weights 0 and 256 take
-// picture 0 and 1 as they are. Alpha is the greater one in the first case and blended like a colour
-// in the others. Then the edge colour: (x * keep + edge) >> 8, where keep 256 and edge 0 change
-// nothing. Alpha always has these.
+// x = (picture1 * w + picture0 * (255 - w)) >> 8 for weights 1..254, where alpha is the greater of
+// the two; the weights 0 and 256 take all four bytes of picture 0 and 1 as they are. Then the edge
+// colour: (x * keep + edge) >> 8, where keep 256 and edge 0 change nothing. Alpha always has these.
 struct MaskBlend {
     uint16_t weight[256][4];
     uint16_t keep[256][4]; // read only when hasEdge

@@ -149,31 +149,34 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
         return;
     }
     CImageARGB target = ViewOf(context, geometry, output);
-    const CImageARGB picture0 = ViewOf(context, geometry, inputs[0]);
-    const CImageARGB picture1 = ViewOf(context, geometry, inputs[1]);
-    BlendJob job = {
-        target, picture0, picture1, m_mask, kMaskBlendRow.For(Resolve(context.cpuLevel)), {}};
-    BuildMaskBlend(job.blend, ReadParams(context));
-    if (pool && context.threadCount >= 2) {
-        RunRowBands(*pool, context.threadCount, geometry.height, BlendJob::RunBand, &job);
-        return;
-    }
+    const CImageARGB pictures[2] = {ViewOf(context, geometry, inputs[0]),
+                                    ViewOf(context, geometry, inputs[1])};
+    const bool inBands = pool && context.threadCount >= 2;
     const DisplayShape shape = GetDisplayShape(context, geometry);
-    if (!shape.differs || geometry.width < kLeastScalable || geometry.height < kLeastScalable) {
-        job.BlendRows(0, geometry.height);
-        return;
-    }
-    for (int i = 0; i < 2; ++i) {
+    const bool isScaled = !inBands && shape.differs && geometry.width >= kLeastScalable &&
+                          geometry.height >= kLeastScalable;
+    for (int i = 0; isScaled && i < 2; ++i) {
         EnsureSize(m_scaled[i], shape.width, geometry.height);
         m_scaled[i].SetCpuLevel(context.cpuLevel);
-        const CImageARGB& picture = i == 0 ? picture0 : picture1;
-        if (!picture.TryResize(m_scaled[i], kBilinear)) {
+        if (!pictures[i].TryResize(m_scaled[i], kBilinear)) {
             throw std::bad_alloc();
         }
     }
-    const BlendJob scaledJob = {m_scaled[0], m_scaled[0], m_scaled[1], m_mask, job.row, job.blend};
-    scaledJob.BlendRows(0, geometry.height);
-    if (!m_scaled[0].TryResize(target, kBilinear)) {
+    BlendJob job = {
+        .output = isScaled ? m_scaled[0] : target,
+        .picture0 = isScaled ? m_scaled[0] : pictures[0],
+        .picture1 = isScaled ? m_scaled[1] : pictures[1],
+        .mask = m_mask,
+        .row = kMaskBlendRow.For(Resolve(context.cpuLevel)),
+        .blend = {},
+    };
+    BuildMaskBlend(job.blend, ReadParams(context));
+    if (inBands) {
+        RunRowBands(*pool, context.threadCount, geometry.height, BlendJob::RunBand, &job);
+        return;
+    }
+    job.BlendRows(0, geometry.height);
+    if (isScaled && !m_scaled[0].TryResize(target, kBilinear)) {
         throw std::bad_alloc();
     }
 }
