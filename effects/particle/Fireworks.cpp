@@ -10,7 +10,7 @@
 namespace kyv {
 namespace {
 
-constexpr PreviewSpan kPreview = {2000.0F, 7000.0F};
+constexpr PreviewSpan kPreview = {2000, 7000.0F};
 constexpr CanvasSize kPreviewCanvas = {320, 240};
 
 bool ReadParams(const EffectContext& context, Fireworks::Instance& instance) {
@@ -37,9 +37,11 @@ void Fireworks::Begin(EffectContext& context, Instance& instance) {
 
 KyvStatus Fireworks::Process(EffectContext& context, Instance& instance) {
     instance.output = context.frame;
+    if (!instance.particles) {
+        return KYV_OK; // not prepared: the frame stays as the host supplied it
+    }
     FrameGeometry geometry;
-    if (!instance.particles || !instance.input || !instance.output ||
-        !GetFrameGeometry(context, geometry)) {
+    if (!instance.input || !instance.output || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
     CParticleFxFireworks& particles = *instance.particles;
