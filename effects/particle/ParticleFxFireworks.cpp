@@ -20,10 +20,16 @@ constexpr float kTrailSpacing = 3.5F; // pixels at scale 1
 // Far more than a spark can leave behind in one step.
 constexpr int kMostTrailSparks = 64;
 
-// No spark of a burst lives longer than 2.4 seconds, and none that it leaves behind outlives this.
-constexpr float kShortestTrailLife = 0.4F; // seconds
+// In seconds; the longest are the sum of the two.
+constexpr float kShortestShellLife = 1.4F;
+constexpr float kShellLifeRange = 1.0F;
+constexpr float kShortestTrailLife = 0.4F;
 constexpr float kTrailLifeRange = 1.0F;
-constexpr int32_t kLongestLifeMs = 2400 + 1400 + 100;
+
+// Of a spark of a burst and then of the last one that it leaves behind, with room for rounding.
+constexpr int32_t kLongestLifeMs =
+    static_cast<int32_t>((kShortestShellLife + kShellLifeRange) * 1000.0F) +
+    static_cast<int32_t>((kShortestTrailLife + kTrailLifeRange) * 1000.0F) + 100;
 
 constexpr float kTrailSpread = 16.0F; // pixels per second at scale 1
 
@@ -73,7 +79,7 @@ void CParticleFxFireworks::SpawnParticle(int32_t) {
         Spark spark = {};
         spark.kind = Spark::Kind::Trail;
         spark.drag = (m_random.Unit() * 0.5F + 0.75F) * m_fDragFactor;
-        spark.startLife = m_random.Unit() + 1.4F;
+        spark.startLife = m_random.Unit() * kShellLifeRange + kShortestShellLife;
         spark.life = spark.startLife;
         spark.size = std::max(8.0F, (m_random.Unit() * 0.3F + 1.0F) * m_fScale * 10.0F);
         Vector direction;
@@ -148,7 +154,8 @@ void CParticleFxFireworks::LeaveTrail(Spark& spark, float fromX, float fromY) {
         left.glitter = random.GetState();
         m_newborn.push_back(left);
     }
-    spark.path = std::max(0.0F, flown - (next - spacing));
+    // What the limit left out is not made up for in the next step.
+    spark.path = std::min(std::max(0.0F, flown - (next - spacing)), spacing);
     spark.glitter = random.GetState();
 }
 

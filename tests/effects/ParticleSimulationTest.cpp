@@ -457,6 +457,23 @@ TEST(FireworksSimulation, SparksGoWhileTheyAreBrightAndTrailsKeepTheirSpacing) {
     EXPECT_GT(trails, 1000U);
 }
 
+// Sparks that fly farther in a step than they may leave others behind for.
+TEST(FireworksSimulation, WhatASparkDidNotLeaveBehindIsNotMadeUpFor) {
+    FireworksRig rig(720, 405, 1.0F, 0.0F);
+    rig.setup.size = 1.4F; // hardly any drag
+    rig.setup.scale = 0.02F;
+    const float spacing = 3.5F * 0.02F; // 64 of them are 4.5 pixels, and a step is 6 to 12
+    rig.particles.SetFrame(rig.setup, StereoMode::Mono);
+    float farthest = 0.0F;
+    for (int32_t time = 0; time <= 99; time += 33) {
+        rig.particles.AdvanceTo(time);
+        for (const Spark& spark : rig.particles.GetParticles()) {
+            farthest = std::max(farthest, spark.path);
+        }
+    }
+    EXPECT_EQ(farthest, spacing);
+}
+
 TEST(FireworksSimulation, TheSparksInTheAirStayBoundedOverTenMinutes) {
     FireworksRig rig(1920, 1080, 1.0F, 1.0F);
     size_t most = 0;
