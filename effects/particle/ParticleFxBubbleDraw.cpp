@@ -120,19 +120,18 @@ void CParticleFxBubble::RenderLenses() {
 // False when too little is inside.
 bool CParticleFxBubble::RefractInto(CImageARGB& scratch, const ParticleRecord& bubble,
                                     float aspect) {
-    const float shift = m_bodyLayer.GetParallax(bubble);
     Rect box = {TruncateToInt(bubble.x), TruncateToInt(bubble.y), TruncateToInt(bubble.size),
                 TruncateToInt(bubble.size * aspect)};
     if (m_mode == StereoMode::LeftView) {
-        box.x = TruncateToInt(static_cast<float>(box.x) - shift);
+        box.x = TruncateToInt(static_cast<float>(box.x) - m_bodyLayer.GetParallax(bubble));
     } else if (m_mode == StereoMode::RightView) {
-        box.x = TruncateToInt(static_cast<float>(box.x) + shift);
+        box.x = TruncateToInt(static_cast<float>(box.x) + m_bodyLayer.GetParallax(bubble));
     }
     const auto w = static_cast<float>(box.w);
     const auto h = static_cast<float>(box.h);
-    const Rect lens = {WrapAdd(box.x, -TruncateToInt(kLensMargin * w)),
-                       WrapAdd(box.y, -TruncateToInt(kLensMargin * h)),
-                       TruncateToInt(kLensSize * w), TruncateToInt(kLensSize * h)};
+    const Rect lens = {WrapSub(box.x, TruncateToInt(kLensMargin * w)),
+                       WrapSub(box.y, TruncateToInt(kLensMargin * h)), TruncateToInt(kLensSize * w),
+                       TruncateToInt(kLensSize * h)};
     CImageARGB behind;
     TakePart(behind, *m_pCanvas, lens);
     behind.SetCpuLevel(m_nCpuLevel);

@@ -30,6 +30,9 @@ CImageARGB& CParticleFxFireworks::GlowOfSize(int32_t size) {
 
 void CParticleFxFireworks::RenderParticles() {
     float shift = m_mode == StereoMode::Mono ? 0.0F : m_stereo.GetParallax(m_emitter.spawn.z);
+    if (std::isnan(shift)) {
+        return; // as sprites are not drawn at such a place
+    }
     if (m_mode == StereoMode::LeftView) {
         shift = -shift;
     }

@@ -56,7 +56,6 @@ public:
     CStereoLibrary(const CStereoLibrary&) = delete;
     CStereoLibrary& operator=(const CStereoLibrary&) = delete;
 
-    bool IsAvailable() const { return m_pObject != nullptr; }
     void Configure(const StereoViewInfo& view);
     // depth -1..1
     float GetParallax(float depth) const;
