@@ -122,10 +122,11 @@ public:
 
     void SaveSnapshot(int32_t index) override {
         Snapshot snapshot = {m_particles, m_clock};
-        const auto old = m_snapshots.find(index);
-        m_nSnapshotBytes -= old == m_snapshots.end() ? 0 : old->second.Bytes();
-        m_nSnapshotBytes += snapshot.Bytes();
-        m_snapshots.insert_or_assign(index, std::move(snapshot));
+        // Counted once nothing more can fail.
+        const auto [place, isNew] = m_snapshots.try_emplace(index);
+        m_nSnapshotBytes -= isNew ? 0 : place->second.Bytes();
+        place->second = std::move(snapshot);
+        m_nSnapshotBytes += place->second.Bytes();
         // What is farthest from here is missed least.
         while (m_nSnapshotBytes > kSnapshotBudget && m_snapshots.size() > 1) {
             const auto first = m_snapshots.begin();
