@@ -19,7 +19,7 @@ constexpr uint16_t kBodyId = 141;
 constexpr uint16_t kMiniatureMaskId = 142;
 constexpr uint16_t kLensMaskId = 143;
 
-constexpr PreviewSpan kPreview = {10000.0F, 15000.0F};
+constexpr PreviewSpan kPreview = {10000, 15000.0F};
 
 void Release(BubbleInstance& instance) {
     delete instance.mask;

@@ -59,7 +59,7 @@ int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview) 
     }
     const float fraction = context.previewFraction;
     const float inside = fraction == fraction ? std::clamp(fraction, 0.0F, 1.0F) : 0.0F;
-    return TruncateToInt(preview.startMs) + TruncateToInt(preview.lengthMs * inside);
+    return preview.startMs + TruncateToInt(preview.lengthMs * inside);
 }
 
 int32_t GetDurationMs(const EffectContext& context) {

@@ -19,7 +19,7 @@ StereoMode GetStereoMode(const FrameGeometry& geometry);
 
 // The moments that a preview's fraction of 0 to 1 runs over.
 struct PreviewSpan {
-    float startMs;
+    int32_t startMs;
     float lengthMs;
 };
 

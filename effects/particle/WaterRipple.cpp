@@ -14,7 +14,7 @@ using KYVImageUtility::CImageARGB;
 
 constexpr uint16_t kSheenId = 145;
 
-constexpr PreviewSpan kPreview = {12000.0F, 8000.0F};
+constexpr PreviewSpan kPreview = {12000, 8000.0F};
 
 } // namespace
 
