@@ -4,6 +4,22 @@
 #include <cstring>
 
 namespace kyv {
+namespace {
+
+// What is absurd: more than this many times the view's own side and, since that may be very short,
+// also more than a picture of this side and this many pixels.
+constexpr int64_t kMostStretch = 16;
+constexpr int64_t kLargestSide = 8192;
+constexpr int64_t kMostPixels = int64_t{1} << 26;
+
+constexpr int64_t kLeastScalable = 2;
+
+bool IsUsable(int64_t side, int32_t ownSide, int32_t keptSide) {
+    return side >= kLeastScalable && (side <= kMostStretch * ownSide ||
+                                      (side <= kLargestSide && side * keptSide <= kMostPixels));
+}
+
+} // namespace
 
 bool GetFrameGeometry(const EffectContext& context, FrameGeometry& geometry) {
     if (context.width == 0 || context.height == 0 || context.width > kMaxFrameSide ||
@@ -20,6 +36,29 @@ bool GetFrameGeometry(const EffectContext& context, FrameGeometry& geometry) {
     geometry.layout = stereo ? context.stereoLayout : uint32_t{StereoLayout_Mono};
     geometry.frameBytes = static_cast<size_t>(geometry.pitchBytes) * context.height;
     return true;
+}
+
+DisplaySize GetDisplaySize(const EffectContext& context, const FrameGeometry& geometry,
+                           KeptSide kept) {
+    const int32_t width = geometry.width;
+    const int32_t height = geometry.height;
+    const int64_t displayWidth = context.displayAspectX != 0 ? context.displayAspectX : width;
+    const int64_t displayHeight = context.displayAspectY != 0 ? context.displayAspectY : height;
+    if (displayWidth * height == displayHeight * width) {
+        return {width, height, false};
+    }
+    if (kept == KeptSide::Width) {
+        const int64_t side = displayHeight * width / displayWidth;
+        if (IsUsable(side, height, width)) {
+            return {width, static_cast<int32_t>(side), true};
+        }
+    } else {
+        const int64_t side = displayWidth * height / displayHeight;
+        if (IsUsable(side, width, height)) {
+            return {static_cast<int32_t>(side), height, true};
+        }
+    }
+    return {width, height, false};
 }
 
 void CopyView(const FrameGeometry& geometry, void* output, const void* input) {

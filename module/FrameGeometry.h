@@ -25,6 +25,25 @@ inline constexpr uint32_t kMaxFrameSide = 1u << 20;
 // False when the context's width or height is 0 or beyond kMaxFrameSide.
 bool GetFrameGeometry(const EffectContext& context, FrameGeometry& geometry);
 
+// The view's size with square pixels on the display that the context tells of.
+struct DisplaySize {
+    int32_t width;
+    int32_t height;
+    bool differs; // in aspect, even where the division gives the view's own size
+};
+
+enum class KeptSide {
+    Width,
+    Height,
+};
+
+// One side of the view stays and the other follows the display's aspect, a zero term of which
+// stands for the view's own side: display width * height / display height, or the other way round,
+// truncated. An aspect that leaves less than 2 pixels, which cannot be scaled, or makes an absurdly
+// large picture, counts as the view's own.
+DisplaySize GetDisplaySize(const EffectContext& context, const FrameGeometry& geometry,
+                           KeptSide kept);
+
 // Copies the view of the call from one frame to another of the same geometry. The frames may be
 // one and the same, but must not overlap otherwise.
 void CopyView(const FrameGeometry& geometry, void* output, const void* input);

@@ -7,9 +7,8 @@
 
 namespace kyv {
 
-// Makes a white square image whose alpha is a hot core in a soft glow that is nothing half a pixel
-// outside the image, so it reaches the edges faintly.
-// Throws std::bad_alloc.
+// Makes a white square image whose alpha is a hot core in a soft glow that ends half a pixel
+// outside the image. Throws std::bad_alloc.
 void DrawGlow(KYVImageUtility::CImageARGB& image, int32_t size);
 
 } // namespace kyv

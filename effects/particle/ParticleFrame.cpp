@@ -13,16 +13,8 @@ using KYVImageUtility::CImageARGB;
 
 constexpr int64_t kUnitsPerMs = 10000; // host times are in 100 ns units
 
-// A canvas this many times as long as the frame's side is not meant.
-constexpr int64_t kMostStretch = 16;
-
 int32_t ToMs(int64_t time) {
     return static_cast<int32_t>(std::clamp<int64_t>(time / kUnitsPerMs, INT32_MIN, INT32_MAX));
-}
-
-bool IsUsable(int64_t canvasSide, int32_t frameSide) {
-    return canvasSide >= 2 && canvasSide <= kMostStretch * frameSide &&
-           canvasSide * kMostStretch >= frameSide;
 }
 
 uint8_t* ViewStart(const FrameGeometry& geometry, void* frame) {
@@ -68,21 +60,14 @@ int32_t GetDurationMs(const EffectContext& context) {
 
 CanvasSize ChooseCanvasSize(const EffectContext& context, const FrameGeometry& geometry,
                             CanvasRule rule) {
-    const int32_t width = geometry.width;
-    const int32_t height = geometry.height;
-    const int64_t displayWidth = context.displayAspectX != 0 ? context.displayAspectX : width;
-    const int64_t displayHeight = context.displayAspectY != 0 ? context.displayAspectY : height;
-    if (geometry.layout != StereoLayout_Mono || displayWidth * height == displayHeight * width) {
-        return {width, height};
+    if (geometry.layout != StereoLayout_Mono) {
+        return {geometry.width, geometry.height};
     }
-    if (rule == CanvasRule::KeepShorterSide && width <= height) {
-        const int64_t side = displayHeight * width / displayWidth;
-        return IsUsable(side, height) ? CanvasSize{width, static_cast<int32_t>(side)}
-                                      : CanvasSize{width, height};
-    }
-    const int64_t side = displayWidth * height / displayHeight;
-    return IsUsable(side, width) ? CanvasSize{static_cast<int32_t>(side), height}
-                                 : CanvasSize{width, height};
+    const bool keepsWidth =
+        rule == CanvasRule::KeepShorterSide && geometry.width <= geometry.height;
+    const DisplaySize size =
+        GetDisplaySize(context, geometry, keepsWidth ? KeptSide::Width : KeptSide::Height);
+    return {size.width, size.height};
 }
 
 CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry, void* frame) {

@@ -21,26 +21,6 @@ using KYVImageUtility::CImageByte;
 constexpr int32_t kRed = 2;
 constexpr int32_t kBilinear = 0;
 constexpr int32_t kLeastScalable = 2; // pixels each way
-// A display shape this many times as wide or narrow as the frame is not meant.
-constexpr int64_t kMostStretch = 16;
-
-struct DisplayShape {
-    int32_t width; // the height is the frame's
-    bool differs;  // by the aspect alone: the width may come out the same all the same
-};
-
-DisplayShape GetDisplayShape(const EffectContext& context, const FrameGeometry& geometry) {
-    const uint64_t aspectX = context.displayAspectX != 0 ? context.displayAspectX : context.width;
-    const uint64_t aspectY = context.displayAspectY != 0 ? context.displayAspectY : context.height;
-    if (context.width * aspectY == context.height * aspectX) {
-        return {geometry.width, false};
-    }
-    const auto width = static_cast<int64_t>(aspectX * context.height / aspectY);
-    const bool usable = width >= kLeastScalable && width <= kMostStretch * geometry.width &&
-                        width * kMostStretch >= geometry.width;
-    return usable ? DisplayShape{static_cast<int32_t>(width), true}
-                  : DisplayShape{geometry.width, false};
-}
 
 CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry, void* frame) {
     CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
@@ -124,8 +104,9 @@ bool CMaskTransition::LoadMask(const EffectContext& context, uint16_t bitmapId) 
     if (!GetFrameGeometry(context, geometry)) {
         return true;
     }
+    const DisplaySize display = GetDisplaySize(context, geometry, KeptSide::Height);
     // A frame of one column or row uses the first of two.
-    CImageARGB fitted(std::max(GetDisplayShape(context, geometry).width, kLeastScalable),
+    CImageARGB fitted(std::max(display.width, kLeastScalable),
                       std::max(geometry.height, kLeastScalable));
     if (!fitted.GetBuffer() || !bitmap.TryResize(fitted, kBilinear)) {
         throw std::bad_alloc();
@@ -152,11 +133,11 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
     const CImageARGB pictures[2] = {ViewOf(context, geometry, inputs[0]),
                                     ViewOf(context, geometry, inputs[1])};
     const bool inBands = pool && context.threadCount >= 2;
-    const DisplayShape shape = GetDisplayShape(context, geometry);
-    const bool isScaled = !inBands && shape.differs && geometry.width >= kLeastScalable &&
+    const DisplaySize display = GetDisplaySize(context, geometry, KeptSide::Height);
+    const bool isScaled = !inBands && display.differs && geometry.width >= kLeastScalable &&
                           geometry.height >= kLeastScalable;
     for (int i = 0; isScaled && i < 2; ++i) {
-        EnsureSize(m_scaled[i], shape.width, geometry.height);
+        EnsureSize(m_scaled[i], display.width, geometry.height);
         m_scaled[i].SetCpuLevel(context.cpuLevel);
         if (!pictures[i].TryResize(m_scaled[i], kBilinear)) {
             throw std::bad_alloc();

@@ -10,6 +10,7 @@
 
 #include <gtest/gtest.h>
 
+#include "effects/particle/ParticleFrame.h"
 #include "imageutility/ImageUtility.h"
 #include "platform/Library.h"
 #include "tests/support/TestHost.h"
@@ -295,6 +296,42 @@ TEST_P(ParticleEffects, ADisplayOfAnotherAspectStretchesTheParticles) {
         EXPECT_LT(different, output.size() / 4);
     } else {
         EXPECT_EQ(output, expected);
+    }
+}
+
+TEST(ParticleCanvas, TakesTheDisplaysAspectFromFramesOfAnyShape) {
+    using kyv::CanvasRule;
+    struct Case {
+        uint32_t width, height, displayX, displayY;
+        CanvasRule rule;
+        int32_t canvasWidth, canvasHeight;
+    };
+    constexpr auto kShorter = CanvasRule::KeepShorterSide;
+    constexpr auto kHeight = CanvasRule::KeepHeight;
+    for (const Case& c : {
+             Case{720, 576, 16, 9, kShorter, 1024, 576}, Case{576, 720, 9, 16, kShorter, 576, 1024},
+             Case{576, 720, 9, 16, kHeight, 405, 720}, Case{720, 576, 0, 0, kShorter, 720, 576},
+             // frames much narrower or lower than their display
+             Case{64, 2048, 1, 1, kShorter, 64, 64}, Case{2048, 64, 1, 1, kShorter, 64, 64},
+             Case{32, 1080, 16, 9, kHeight, 1920, 1080}, Case{2, 4096, 2, 1, kHeight, 8192, 4096},
+             Case{4096, 64, 1, 32, kShorter, 2, 64},
+             // no picture could be made: the frame's own size
+             Case{4096, 64, 1, 64, kShorter, 4096, 64},
+             Case{30, 20, 0xFFFFFFFF, 1, kHeight, 30, 20},
+             Case{30, 20, 1, 0xFFFFFFFF, kHeight, 30, 20},
+             Case{20, 30, 1, 0xFFFFFFFF, kShorter, 20, 30},
+             Case{2, 1 << 20, 1, 128, kHeight, 2, 1 << 20}, // 8192 wide
+         }) {
+        EffectContext context = {};
+        context.width = c.width;
+        context.height = c.height;
+        context.displayAspectX = c.displayX;
+        context.displayAspectY = c.displayY;
+        kyv::FrameGeometry geometry;
+        ASSERT_TRUE(kyv::GetFrameGeometry(context, geometry));
+        const kyv::CanvasSize size = kyv::ChooseCanvasSize(context, geometry, c.rule);
+        EXPECT_EQ(std::pair(size.width, size.height), std::pair(c.canvasWidth, c.canvasHeight))
+            << c.width << "x" << c.height << " on " << c.displayX << ":" << c.displayY;
     }
 }
 

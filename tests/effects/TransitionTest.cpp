@@ -302,6 +302,27 @@ TEST_P(Transition, DisplayAspectIsCorrectedOnOneThreadAlone) {
     }
 }
 
+// Narrow or low by a factor that no usual frame has.
+TEST_P(Transition, FramesMuchUnlikeTheirDisplayAreCorrectedToo) {
+    struct Case {
+        uint32_t width, height, x, y, displayWidth; // height * x / y
+    };
+    for (const Case& c : {Case{3, 90, 16, 9, 160}, Case{160, 4, 1, 1, 4}, Case{160, 4, 1, 2, 2}}) {
+        const Frame a = RandomFrame(size_t{c.width} * c.height, 17);
+        const Frame b = RandomFrame(a.size(), 18);
+        CTestInstance instance(effect(), c.width, c.height);
+        instance.Context().displayAspectX = c.x;
+        instance.Context().displayAspectY = c.y;
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        const Settings settings = {.percentage = 0.5F};
+        Apply(instance, settings);
+        const Mask mask = FitMask(GetParam(), c.displayWidth, c.height);
+        EXPECT_EQ(RenderFrame(instance, a, b),
+                  RenderInDisplayShape(a, b, c.width, c.height, mask, settings))
+            << c.width << "x" << c.height;
+    }
+}
+
 TEST_P(Transition, StereoViewLeavesTheOtherViewAlone) {
     constexpr uint32_t kWidth = 20, kHeight = 16;
     const Frame a = RandomFrame(2 * kWidth * kHeight, 7), b = RandomFrame(2 * kWidth * kHeight, 8);
