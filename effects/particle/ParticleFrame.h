@@ -60,11 +60,6 @@ public:
 
     KYVImageUtility::CImageARGB& GetImage() { return m_bScaled ? m_canvas : m_frame; }
 
-    // The output frame's picture at its own size, in the canvas's format: the canvas itself unless
-    // that is scaled.
-    const KYVImageUtility::CImageARGB& GetFrame() const { return m_frame; }
-    bool IsConverted() const { return m_bConverted; }
-
     // Fills the canvas from the frame, and puts it back. Throw std::bad_alloc.
     void Load();
     void Store();

@@ -21,7 +21,6 @@ void CParticleFxWaterripple::SetFrame(const FrameSetup& setup) {
     SetMaxParticles(-1);
     SetLongestLife(kLongestLifeMs);
     m_pCanvas = setup.canvas;
-    m_pSource = setup.source;
     if (m_nWidth != setup.canvas->GetWidth() || m_nHeight != setup.canvas->GetHeight()) {
         ClearSnapshots();
         m_nWidth = setup.canvas->GetWidth();

@@ -21,10 +21,9 @@ struct Ripple {
 class CParticleFxWaterripple : public CParticleFx<Ripple> {
 public:
     struct FrameSetup {
-        // B, G, R, A; all stay the caller's. Canvas and source are used until the picture is
-        // drawn; the sheen is needed at the first SetFrame alone.
+        // B, G, R, A; both stay the caller's. The canvas holds the scene and is used until the
+        // picture is drawn; the sheen is needed at the first SetFrame alone.
         KYVImageUtility::CImageARGB* canvas;
-        const KYVImageUtility::CImageARGB* source;
         const KYVImageUtility::CImageARGB* sheen;
         float scale;   // canvas width / 720
         float density; // 0..1
@@ -42,7 +41,6 @@ public:
 
 private:
     KYVImageUtility::CImageARGB* m_pCanvas = nullptr;
-    const KYVImageUtility::CImageARGB* m_pSource = nullptr;
     KYVImageUtility::CImageARGB m_sheen; // at the first canvas's size
     int32_t m_nWidth = 0;                // of the canvas
     int32_t m_nHeight = 0;

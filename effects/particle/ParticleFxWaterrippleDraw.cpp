@@ -162,7 +162,6 @@ void CParticleFxWaterripple::RenderParticles() {
         canvas.CopyFrom(water);
         return;
     }
-    m_pCanvas->CopyFrom(*m_pSource);
     canvas.SetCpuLevel(m_nCpuLevel);
     canvas.AlphaBlend(water, fade);
 }

@@ -47,12 +47,9 @@ KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
     CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::Argb);
-    const CImageARGB input = ViewOf(context, geometry, instance.input);
     instance.sheen->SetCpuLevel(context.cpuLevel);
     particles.SetFrame({
         .canvas = &canvas.GetImage(),
-        // The converted frame is the source as the canvas's format has it.
-        .source = canvas.IsConverted() ? &canvas.GetFrame() : &input,
         .sheen = instance.sheen,
         .scale = static_cast<float>(canvas.GetImage().GetWidth()) / 720.0F,
         .density = density,

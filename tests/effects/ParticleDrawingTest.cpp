@@ -104,12 +104,11 @@ TEST(RippleDrawing, BendsLikeTheSlowFormAtEveryLevel) {
 
             Frame output = input;
             CImageARGB canvas = Wrap(output, c.width);
-            CImageARGB source = Wrap(input, c.width);
             CImageARGB noSheen; // stays clear: adds nothing
             noSheen.Create(2, 2);
             noSheen.FillBytes(0);
             CRippleProbe probe;
-            probe.SetFrame({&canvas, &source, &noSheen, 1.0F, 0.5F, level});
+            probe.SetFrame({&canvas, &noSheen, 1.0F, 0.5F, level});
             probe.Take(c.ripples);
             probe.RenderParticles();
             ASSERT_EQ(output, expected) << c.width << "x" << c.height << " level " << level;
@@ -124,11 +123,10 @@ TEST(RippleDrawing, AddsTheSheenFadesItAndKeepsItsFirstSize) {
     Frame input(8 * 8, 0x20102030);
     Frame output = input;
     CImageARGB canvas = Wrap(output, 8);
-    CImageARGB source = Wrap(input, 8);
     CImageARGB sheen(4, 4);
     sheen.FillBytes(64); // 64 of each colour at alpha 64: (64 * 64) >> 8 = 16 more
     CRippleProbe probe;
-    probe.SetFrame({&canvas, &source, &sheen, 1.0F, 0.0F, 0});
+    probe.SetFrame({&canvas, &sheen, 1.0F, 0.0F, 0});
     probe.SetDuration(1000);
     probe.AdvanceTo(500);
     probe.Take({});
@@ -146,8 +144,7 @@ TEST(RippleDrawing, AddsTheSheenFadesItAndKeepsItsFirstSize) {
     Frame largeInput(10 * 12, 0x20102030);
     Frame largeOutput = largeInput;
     CImageARGB largeCanvas = Wrap(largeOutput, 10);
-    CImageARGB largeSource = Wrap(largeInput, 10);
-    probe.SetFrame({&largeCanvas, &largeSource, &sheen, 1.0F, 0.0F, 0});
+    probe.SetFrame({&largeCanvas, &sheen, 1.0F, 0.0F, 0});
     probe.AdvanceTo(500);
     probe.Take({});
     probe.RenderIfVisible();

@@ -318,8 +318,7 @@ struct FireworksRig {
 struct RippleRig {
     RippleRig(int32_t width, int32_t height, float density) : canvas(width, height), sheen(4, 4) {
         sheen.FillBytes(0);
-        particles.SetFrame(
-            {&canvas, &canvas, &sheen, static_cast<float>(width) / 720.0F, density, 0});
+        particles.SetFrame({&canvas, &sheen, static_cast<float>(width) / 720.0F, density, 0});
     }
 
     CImageARGB canvas;
