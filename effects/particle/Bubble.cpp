@@ -19,6 +19,7 @@ constexpr uint16_t kBodyId = 141;
 constexpr uint16_t kMiniatureMaskId = 142;
 constexpr uint16_t kLensMaskId = 143;
 
+constexpr ParamLimits kLimits[] = {{0.0F, 1.0F}, {0.0F, 1.0F}, {0.0F, 1.0F}, {-1.0F, 1.0F}};
 constexpr PreviewSpan kPreview = {10000, 15000.0F};
 
 void Release(BubbleInstance& instance) {
@@ -54,20 +55,6 @@ void Begin(EffectContext& context, BubbleInstance& instance, uint16_t maskId) {
     instance.mask = mask.release();
 }
 
-bool ReadParams(const EffectContext& context, BubbleInstance& instance) {
-    const CParamReader reader(context);
-    const float params[] = {
-        ReadWithin(reader, 0, 0.0F, 1.0F),
-        ReadWithin(reader, 1, 0.0F, 1.0F),
-        ReadWithin(reader, 2, 0.0F, 1.0F),
-        ReadWithin(reader, 3, -1.0F, 1.0F),
-    };
-    const bool changed =
-        !std::equal(std::begin(params), std::end(params), std::begin(instance.params));
-    std::copy(std::begin(params), std::end(params), std::begin(instance.params));
-    return changed;
-}
-
 KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefractive) {
     instance.output = context.frame;
     if (!instance.particles || !instance.body || !instance.body->GetBuffer() || !instance.mask ||
@@ -79,14 +66,13 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
         return KYV_FAIL;
     }
     CParticleFxBubble& particles = *instance.particles;
-    if (ReadParams(context, instance)) {
+    if (ReadChanged(context, kLimits, instance.params)) {
         particles.ClearSnapshots();
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
     CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::AsTheyCome);
     const CImageARGB source = ViewOf(context, geometry, instance.input);
-    const auto width = static_cast<float>(canvas.GetImage().GetWidth());
-    const auto height = static_cast<float>(canvas.GetImage().GetHeight());
+    const ParticleBounds bounds = canvas.GetBounds();
     particles.SetFrame(
         {
             .density = instance.params[2],
@@ -95,13 +81,13 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
             .isRefractive = isRefractive,
             .displayWidth = static_cast<int32_t>(context.displayAspectX),
             .displayHeight = static_cast<int32_t>(context.displayAspectY),
-            .scale = width / 720.0F,
+            .scale = canvas.GetScale(),
             .spawn = {.x = 0.0F,
-                      .y = height - 1.0F,
+                      .y = bounds.bottom - 1.0F,
                       .z = instance.params[3],
-                      .xRange = width,
+                      .xRange = bounds.width,
                       .yRange = 0.0F},
-            .bounds = {.left = 0.0F, .top = 0.0F, .width = width, .bottom = height},
+            .bounds = bounds,
             .canvas = &canvas.GetImage(),
             .source = &source,
             .body = instance.body,
@@ -109,15 +95,7 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
             .cpuLevel = context.cpuLevel,
         },
         GetStereoMode(geometry));
-    particles.SetDuration(GetDurationMs(context));
-    particles.AdvanceTo(GetPositionMs(context, kPreview));
-
-    CopyView(geometry, instance.output, instance.input);
-    if (particles.IsVisible()) {
-        canvas.Load();
-        particles.RenderIfVisible();
-        canvas.Store();
-    }
+    DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);
     return KYV_OK;
 }
 

@@ -10,21 +10,9 @@
 namespace kyv {
 namespace {
 
+constexpr ParamLimits kLimits[] = {{0.0F, 1.0F}, {0.0F, 1.0F}, {-1.0F, 1.0F}};
 constexpr PreviewSpan kPreview = {2000, 7000.0F};
 constexpr CanvasSize kPreviewCanvas = {320, 240};
-
-bool ReadParams(const EffectContext& context, Fireworks::Instance& instance) {
-    const CParamReader reader(context);
-    const float params[] = {
-        ReadWithin(reader, 0, 0.0F, 1.0F),
-        ReadWithin(reader, 1, 0.0F, 1.0F),
-        ReadWithin(reader, 2, -1.0F, 1.0F),
-    };
-    const bool changed =
-        !std::equal(std::begin(params), std::end(params), std::begin(instance.params));
-    std::copy(std::begin(params), std::end(params), std::begin(instance.params));
-    return changed;
-}
 
 } // namespace
 
@@ -45,7 +33,7 @@ KyvStatus Fireworks::Process(EffectContext& context, Instance& instance) {
         return KYV_FAIL;
     }
     CParticleFxFireworks& particles = *instance.particles;
-    if (ReadParams(context, instance)) {
+    if (ReadChanged(context, kLimits, instance.params)) {
         particles.ClearSnapshots();
     }
     // A preview is drawn small and scaled up.
@@ -53,29 +41,23 @@ KyvStatus Fireworks::Process(EffectContext& context, Instance& instance) {
                                 ? kPreviewCanvas
                                 : ChooseCanvasSize(context, geometry, CanvasRule::KeepHeight);
     CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::Argb);
-    const auto width = static_cast<float>(canvas.GetImage().GetWidth());
-    const auto height = static_cast<float>(canvas.GetImage().GetHeight());
+    const ParticleBounds bounds = canvas.GetBounds();
     particles.SetFrame(
         {
             .size = instance.params[0],
             .density = instance.params[1],
-            .scale = width / 720.0F,
-            .spawn =
-                {.x = 0.0F, .y = 0.0F, .z = instance.params[2], .xRange = width, .yRange = height},
-            .bounds = {.left = 0.0F, .top = 0.0F, .width = width, .bottom = height},
+            .scale = canvas.GetScale(),
+            .spawn = {.x = 0.0F,
+                      .y = 0.0F,
+                      .z = instance.params[2],
+                      .xRange = bounds.width,
+                      .yRange = bounds.bottom},
+            .bounds = bounds,
             .canvas = &canvas.GetImage(),
             .cpuLevel = context.cpuLevel,
         },
         GetStereoMode(geometry));
-    particles.SetDuration(GetDurationMs(context));
-    particles.AdvanceTo(GetPositionMs(context, kPreview));
-
-    CopyView(geometry, instance.output, instance.input);
-    if (particles.IsVisible()) {
-        canvas.Load();
-        particles.RenderIfVisible();
-        canvas.Store();
-    }
+    DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);
     return KYV_OK;
 }
 

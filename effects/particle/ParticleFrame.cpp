@@ -5,6 +5,7 @@
 #include <new>
 
 #include "effects/particle/ParticleMath.h"
+#include "module/ParamReader.h"
 
 namespace kyv {
 namespace {
@@ -21,6 +22,15 @@ uint8_t* ViewStart(const FrameGeometry& geometry, void* frame) {
     return static_cast<uint8_t*>(frame) + geometry.viewOffset;
 }
 
+int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview) {
+    if (context.preview == 0) {
+        return std::max(ToMs(context.position), 0);
+    }
+    const float fraction = context.previewFraction;
+    const float inside = fraction == fraction ? std::clamp(fraction, 0.0F, 1.0F) : 0.0F;
+    return preview.startMs + TruncateToInt(preview.lengthMs * inside);
+}
+
 void Scale(const CImageARGB& from, CImageARGB& to) {
     if (!from.TryResize(to, 0)) {
         throw std::bad_alloc();
@@ -29,9 +39,18 @@ void Scale(const CImageARGB& from, CImageARGB& to) {
 
 } // namespace
 
-float ReadWithin(const CParamReader& params, uint32_t index, float minimum, float maximum) {
-    const float value = params.Float(index);
-    return value == value ? std::clamp(value, minimum, maximum) : 0.0F;
+bool ReadChanged(const EffectContext& context, const ParamLimits* limits, float* cached,
+                 size_t count) {
+    const CParamReader reader(context);
+    bool changed = false;
+    for (size_t i = 0; i < count; ++i) {
+        const float read = reader.Float(static_cast<uint32_t>(i));
+        const float value =
+            read == read ? std::clamp(read, limits[i].minimum, limits[i].maximum) : 0.0F;
+        changed = changed || value != cached[i];
+        cached[i] = value;
+    }
+    return changed;
 }
 
 StereoMode GetStereoMode(const FrameGeometry& geometry) {
@@ -43,19 +62,6 @@ StereoMode GetStereoMode(const FrameGeometry& geometry) {
     default:
         return StereoMode::Mono;
     }
-}
-
-int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview) {
-    if (context.preview == 0) {
-        return std::max(ToMs(context.position), 0);
-    }
-    const float fraction = context.previewFraction;
-    const float inside = fraction == fraction ? std::clamp(fraction, 0.0F, 1.0F) : 0.0F;
-    return preview.startMs + TruncateToInt(preview.lengthMs * inside);
-}
-
-int32_t GetDurationMs(const EffectContext& context) {
-    return ToMs(context.duration);
 }
 
 CanvasSize ChooseCanvasSize(const EffectContext& context, const FrameGeometry& geometry,
@@ -98,6 +104,14 @@ CParticleCanvas::CParticleCanvas(const EffectContext& context, const FrameGeomet
     }
 }
 
+ParticleBounds CParticleCanvas::GetBounds() const {
+    const CImageARGB& image = m_bScaled ? m_canvas : m_frame;
+    return {.left = 0.0F,
+            .top = 0.0F,
+            .width = static_cast<float>(image.GetWidth()),
+            .bottom = static_cast<float>(image.GetHeight())};
+}
+
 void CParticleCanvas::Load() {
     if (m_bConverted) {
         m_ayuvView.ToARGB(m_frame);
@@ -113,6 +127,20 @@ void CParticleCanvas::Store() {
     }
     if (m_bConverted) {
         m_frame.ToAYUV(m_ayuvView);
+    }
+}
+
+void DrawAnimation(const EffectContext& context, const FrameGeometry& geometry,
+                   const PreviewSpan& preview, const void* input, CParticleCanvas& canvas,
+                   CParticleFxBase& particles) {
+    particles.SetDuration(ToMs(context.duration));
+    particles.AdvanceTo(GetPositionMs(context, preview));
+
+    CopyView(geometry, context.frame, input);
+    if (particles.IsVisible()) {
+        canvas.Load();
+        particles.RenderIfVisible();
+        canvas.Store();
     }
 }
 

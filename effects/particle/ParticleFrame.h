@@ -2,18 +2,33 @@
 // particles are drawn on.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 
+#include "effects/particle/ParticleFxBase.h"
+#include "effects/particle/ParticleRecord.h"
 #include "effects/particle/StereoLibrary.h"
 #include "imageutility/ImageUtility.h"
 #include "module/FrameGeometry.h"
 #include "module/HostInterface.h"
-#include "module/ParamReader.h"
 
 namespace kyv {
 
-// A parameter as simulations may have it: within the limits, and 0 for what is not a number.
-float ReadWithin(const CParamReader& params, uint32_t index, float minimum, float maximum);
+struct ParamLimits {
+    float minimum;
+    float maximum;
+};
+
+// The first parameters as simulations may have them: within the limits, and 0 for what is not a
+// number. True when one differs from its cached value; all are cached then.
+bool ReadChanged(const EffectContext& context, const ParamLimits* limits, float* cached,
+                 size_t count);
+
+template <size_t kCount>
+bool ReadChanged(const EffectContext& context, const ParamLimits (&limits)[kCount],
+                 float (&cached)[kCount]) {
+    return ReadChanged(context, limits, cached, kCount);
+}
 
 StereoMode GetStereoMode(const FrameGeometry& geometry);
 
@@ -22,9 +37,6 @@ struct PreviewSpan {
     int32_t startMs;
     float lengthMs;
 };
-
-int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview);
-int32_t GetDurationMs(const EffectContext& context);
 
 struct CanvasSize {
     int32_t width;
@@ -60,6 +72,9 @@ public:
 
     KYVImageUtility::CImageARGB& GetImage() { return m_bScaled ? m_canvas : m_frame; }
 
+    float GetScale() const { return GetBounds().width / 720.0F; } // sizes are made for this width
+    ParticleBounds GetBounds() const;
+
     // Fills the canvas from the frame, and puts it back. Throw std::bad_alloc.
     void Load();
     void Store();
@@ -71,6 +86,12 @@ private:
     KYVImageUtility::CImageARGB m_frame; // the view itself, or its conversion
     KYVImageUtility::CImageARGB m_canvas;
 };
+
+// Brings an animation, whose frame is set, to the call's moment, copies the input's view to the
+// output and draws the particles on it. Throws std::bad_alloc.
+void DrawAnimation(const EffectContext& context, const FrameGeometry& geometry,
+                   const PreviewSpan& preview, const void* input, CParticleCanvas& canvas,
+                   CParticleFxBase& particles);
 
 // The call's view of a frame of the host's, as it comes.
 KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,

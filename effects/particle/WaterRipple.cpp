@@ -14,13 +14,14 @@ using KYVImageUtility::CImageARGB;
 
 constexpr uint16_t kSheenId = 145;
 
+constexpr ParamLimits kLimits[] = {{0.0F, 1.0F}};
 constexpr PreviewSpan kPreview = {12000, 8000.0F};
 
 } // namespace
 
 void WaterRipple::Begin(EffectContext& context, Instance& instance) {
     Release(context, instance); // a host may prepare twice
-    instance.density = 0.0F;
+    instance.params[0] = 0.0F;
     auto particles = std::make_unique<CParticleFxWaterripple>();
     auto sheen = std::make_unique<CImageARGB>();
     if (context.descriptor && context.descriptor->module) {
@@ -40,10 +41,8 @@ KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
         return KYV_FAIL;
     }
     CParticleFxWaterripple& particles = *instance.particles;
-    const float density = ReadWithin(CParamReader(context), 0, 0.0F, 1.0F);
-    if (density != instance.density) {
+    if (ReadChanged(context, kLimits, instance.params)) {
         particles.ClearSnapshots();
-        instance.density = density;
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
     CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::Argb);
@@ -51,19 +50,11 @@ KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
     particles.SetFrame({
         .canvas = &canvas.GetImage(),
         .sheen = instance.sheen,
-        .scale = static_cast<float>(canvas.GetImage().GetWidth()) / 720.0F,
-        .density = density,
+        .scale = canvas.GetScale(),
+        .density = instance.params[0],
         .cpuLevel = context.cpuLevel,
     });
-    particles.SetDuration(GetDurationMs(context));
-    particles.AdvanceTo(GetPositionMs(context, kPreview));
-
-    CopyView(geometry, instance.output, instance.input);
-    if (particles.IsVisible()) {
-        canvas.Load();
-        particles.RenderIfVisible();
-        canvas.Store();
-    }
+    DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);
     return KYV_OK;
 }
 

@@ -19,7 +19,7 @@ struct WaterRipple {
         void* output;
         CParticleFxWaterripple* particles;  // owned, as is the image
         KYVImageUtility::CImageARGB* sheen; // B, G, R, A
-        float density;                      // what the animation was last simulated with
+        float params[1];                    // what the animation was last simulated with
     };
     static_assert(sizeof(Instance) == 40);
 
