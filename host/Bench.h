@@ -10,7 +10,7 @@ namespace kyvhost {
 struct BenchOptions {
     std::string effect;
     EffectSettings settings; // its level does not count
-    std::vector<int32_t> levels = {CpuLevel_Scalar, CpuLevel_Sse2, CpuLevel_Ssse3, CpuLevel_Avx2};
+    std::vector<int32_t> levels = {CpuLevel_Scalar, CpuLevel_Sse2, CpuLevel_Avx2};
     Size size = {1920, 1080};
     int rounds = 0; // frames a level; 0: about two seconds for each
     bool json = false;

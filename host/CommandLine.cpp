@@ -5,6 +5,7 @@
 #include <cmath>
 #include <cstdio>
 #include <functional>
+#include <iostream>
 #include <map>
 #include <new>
 #include <optional>
@@ -72,6 +73,14 @@ int32_t ParseLevel(std::string_view text) {
     return ParseWhole<int32_t>("--level", text, 0, 5);
 }
 
+// What was printed counts only when it has arrived.
+void FlushOutput() {
+    std::cout.flush(); // help
+    if (std::fflush(stdout) != 0 || std::ferror(stdout) || !std::cout) {
+        throw CHostError(ExitStatus::RenderingFailed, "the standard output cannot be written");
+    }
+}
+
 class CCommandLine {
 public:
     CCommandLine() : m_app("Renders the video effects of a KYV DSP module.", "kyvhost") {
@@ -96,6 +105,7 @@ public:
             m_app.parse(std::vector<std::string>(arguments.rbegin(), arguments.rend()));
         } catch (const CLI::Success& wanted) { // help or version
             m_app.exit(wanted);
+            FlushOutput();
             return;
         } catch (const CLI::ParseError& error) {
             if (!m_app.remaining(true).empty()) {
@@ -105,6 +115,7 @@ public:
                 Verb() ? error.what() : "a verb is missing: list, info, render, bench or gallery"));
         }
         m_action();
+        FlushOutput();
     }
 
 private:
@@ -173,7 +184,7 @@ private:
 
     void AddLevel(CLI::App* verb) {
         AddText(verb, "--level", "0..5",
-                "instruction sets: 0 none, 3 SSE2, 4 SSSE3, 5 AVX2; default: 5",
+                "instruction sets: below 3 none, 3 SSE2, 4 and 5 the best there is; default: 5",
                 [this](const std::string& text) { m_render.settings.level = ParseLevel(text); });
     }
 
@@ -259,7 +270,7 @@ private:
                                        &CCommandLine::BenchEffect);
         AddEffect(verb);
         AddSettings(verb);
-        AddText(verb, "--level", "0..5", "one level only; default: 0, 3, 4 and 5",
+        AddText(verb, "--level", "0..5", "one level only; default: 0, 3 and 5",
                 [this](const std::string& text) { m_bench.levels = {ParseLevel(text)}; });
         AddText(verb, "--size", "WxH", "of the frame; default: 1920x1080",
                 [this](const std::string& text) { m_bench.size = ParseSize("--size", text); });

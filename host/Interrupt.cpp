@@ -6,6 +6,7 @@
 #include <mutex>
 
 #include "host/ExitStatus.h"
+#include "host/Progress.h"
 #include "platform/Console.h"
 
 namespace kyvhost {
@@ -20,7 +21,7 @@ void Leave() {
     for (auto action = g_actions.rbegin(); action != g_actions.rend(); ++action) {
         (*action)();
     }
-    std::fputs("\nkyvhost: interrupted\n", stderr);
+    std::fprintf(stderr, "%skyvhost: interrupted\n", CProgress::IsLineOpen() ? "\n" : "");
     std::_Exit(static_cast<int>(ExitStatus::Interrupted));
 }
 

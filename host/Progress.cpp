@@ -42,7 +42,7 @@ CProgress::CProgress(int64_t total, bool quiet)
 }
 
 CProgress::~CProgress() {
-    if (m_bLineOpen) {
+    if (s_bLineOpen) {
         std::fputc('\n', stderr);
     }
 }
@@ -78,7 +78,7 @@ void CProgress::Update(int64_t done) {
     m_next = Clock::now() + (m_bTerminal ? Clock::duration(kTerminalStep) : kLineStep);
     if (m_bTerminal) {
         std::fprintf(stderr, "\r%s\033[K", Line(done).c_str());
-        m_bLineOpen = true;
+        s_bLineOpen = true;
     } else {
         std::fprintf(stderr, "%s\n", Line(done).c_str());
     }
@@ -88,11 +88,11 @@ void CProgress::Finish(int64_t done) {
     if (m_bQuiet) {
         return;
     }
-    std::fprintf(stderr, "%s%lld frames in %s s, %s frames/s%s\n", m_bLineOpen ? "\r" : "",
+    std::fprintf(stderr, "%s%lld frames in %s s, %s frames/s%s\n", s_bLineOpen ? "\r" : "",
                  static_cast<long long>(done), Decimal(Seconds()).c_str(),
                  Decimal(static_cast<double>(done) / Seconds()).c_str(),
-                 m_bLineOpen ? "\033[K" : "");
-    m_bLineOpen = false;
+                 s_bLineOpen ? "\033[K" : "");
+    s_bLineOpen = false;
 }
 
 } // namespace kyvhost

@@ -1,6 +1,7 @@
 // How far a rendering is, on standard error: a bar on a terminal, a line now and then elsewhere.
 #pragma once
 
+#include <atomic>
 #include <chrono>
 #include <cstdint>
 #include <string>
@@ -24,6 +25,9 @@ public:
     // The last line: frames, time and rate.
     void Finish(int64_t done);
 
+    // Whether the bar stands on a terminal without an end of line. From any thread.
+    static bool IsLineOpen() { return s_bLineOpen; }
+
 private:
     using Clock = std::chrono::steady_clock;
 
@@ -33,9 +37,10 @@ private:
     int64_t m_nTotal;
     bool m_bQuiet;
     bool m_bTerminal;
-    bool m_bLineOpen = false; // on a terminal: the bar stands without an end of line
     Clock::time_point m_start = Clock::now();
     Clock::time_point m_next;
+
+    static inline std::atomic<bool> s_bLineOpen = false; // there is one terminal
 };
 
 } // namespace kyvhost
