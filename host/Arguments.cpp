@@ -34,6 +34,10 @@ Size ParsePair(std::string_view what, std::string_view text, char separator, uin
         if (first && second && *first >= 1 && *second >= 1 && *first <= most && *second <= most) {
             return {*first, *second};
         }
+        if (IsWholeNumber(parts[0]) && IsWholeNumber(parts[1])) {
+            throw CUsageError(std::string(what) + ": " + std::string(text) +
+                              " is out of range: each number 1 to " + std::to_string(most));
+        }
     }
     Refuse(what, text, wanted);
 }
@@ -77,8 +81,12 @@ Rational ParseRate(std::string_view what, std::string_view text) {
         rate = {pair.width, pair.height};
     } else {
         const auto number = Number<double>(text);
-        if (!number || !(*number > 0) || !(*number <= 1000)) {
+        if (!number || std::isnan(*number)) {
             Refuse(what, text, kWanted);
+        }
+        if (*number < 0.001 || *number > 1000) {
+            throw CUsageError(std::string(what) + ": " + std::string(text) +
+                              " is out of range: 0.001 to 1000");
         }
         rate = {std::llround(*number * 1000), 1000};
     }

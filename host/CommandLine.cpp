@@ -50,9 +50,14 @@ T ParseWhole(std::string_view what, std::string_view text, T least, T most) {
     T number = 0;
     const char* const end = text.data() + text.size();
     const auto [stop, error] = std::from_chars(text.data(), end, number);
-    if (error != std::errc() || stop != end || number < least || number > most) {
+    const std::string range = std::to_string(least) + " to " + std::to_string(most);
+    if (!IsWholeNumber(text)) {
         throw CUsageError(std::string(what) + ": " + Quoted(text) + " is not a whole number, " +
-                          std::to_string(least) + " to " + std::to_string(most));
+                          range);
+    }
+    if (error != std::errc() || stop != end || number < least || number > most) {
+        throw CUsageError(std::string(what) + ": " + std::string(text) +
+                          " is out of range: " + range);
     }
     return number;
 }
@@ -159,14 +164,17 @@ private:
                 });
         AddText(verb, "--preview", "0..1", "show the moment that effects have for previews",
                 [&settings](const std::string& text) {
-                    float fraction = -1;
+                    double fraction = -1;
                     const char* const end = text.data() + text.size();
                     const auto [stop, error] = std::from_chars(text.data(), end, fraction);
-                    if (error != std::errc() || stop != end || !(fraction >= 0 && fraction <= 1)) {
+                    if (error != std::errc() || stop != end || std::isnan(fraction)) {
                         throw CUsageError("--preview: " + Quoted(text) +
                                           " is not a number, 0 to 1");
                     }
-                    settings.preview = fraction;
+                    if (fraction < 0 || fraction > 1) {
+                        throw CUsageError("--preview: " + text + " is out of range: 0 to 1");
+                    }
+                    settings.preview = static_cast<float>(fraction);
                 });
     }
 
@@ -361,8 +369,10 @@ private:
             for (const CLI::App* candidate : m_app.get_subcommands({})) {
                 names.push_back(candidate->get_name());
             }
-            throw CUsageError("no verb " + Quoted(extra) + "; the nearest is " +
-                              Nearest(extra, names));
+            const std::string nearest = Nearest(extra, names);
+            throw CUsageError("no verb " + Quoted(extra) +
+                              (nearest.empty() ? "; name one of " + Join(names, ", ")
+                                               : "; the nearest is " + nearest));
         }
         if (!extra.starts_with('-')) {
             throw CUsageError(WithHint(Quoted(extra) + " is one argument too many"));
@@ -373,8 +383,10 @@ private:
             }
         }
         names.emplace_back("--module");
-        throw CUsageError("no option " + Quoted(extra.substr(0, extra.find('='))) +
-                          "; the nearest is " + Nearest(extra.substr(0, extra.find('=')), names));
+        const std::string option = extra.substr(0, extra.find('='));
+        const std::string nearest = Nearest(option, names);
+        throw CUsageError(WithHint("no option " + Quoted(option) +
+                                   (nearest.empty() ? "" : "; the nearest is " + nearest)));
     }
 
     CLI::App m_app;

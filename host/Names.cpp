@@ -49,9 +49,15 @@ bool WordEndsBefore(std::string_view text, size_t i) {
 
 // Whether text is a part of the name that can stand for it: shorter ones are in too many.
 bool IsPart(std::string_view text, std::string_view name) {
-    constexpr size_t kLeastLetters = 3;
+    constexpr size_t kLeastLetters = 2;
     const std::string part = Normalized(text);
     return part.size() >= kLeastLetters && Normalized(name).find(part) != std::string::npos;
+}
+
+// The end of "no effect x": the nearest name, if one is near, and where all are.
+std::string WithNearest(const std::string& nearest, const std::string& where) {
+    return nearest.empty() ? "; " + where
+                           : "; the nearest is " + Quoted(nearest) + " (" + where + ")";
 }
 
 std::string_view WithoutLabels(std::string_view nameKey) {
@@ -172,11 +178,11 @@ std::string Normalized(std::string_view text) {
 }
 
 const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text) {
-    uint32_t index = 0;
-    const char* const end = text.data() + text.size();
-    if (const auto [stop, error] = std::from_chars(text.data(), end, index);
-        error == std::errc() && stop == end) {
-        if (index < module.effectCount) {
+    if (IsWholeNumber(text)) {
+        uint32_t index = 0;
+        const char* const end = text.data() + text.size();
+        const auto [stop, error] = std::from_chars(text.data(), end, index);
+        if (error == std::errc() && stop == end && index < module.effectCount) {
             return module.effects[index];
         }
         throw CUsageError("no effect " + std::string(text) + "; the indices are 0 to " +
@@ -204,8 +210,8 @@ const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_v
     if (parts.size() > 1) {
         throw CUsageError("several effects are called " + Quoted(text) + ": " + Join(parts, ", "));
     }
-    throw CUsageError("no effect " + Quoted(text) + "; the nearest is " +
-                      Quoted(Nearest(text, names)) + " (kyvhost list shows all)");
+    throw CUsageError("no effect " + Quoted(text) +
+                      WithNearest(Nearest(text, names), "kyvhost list shows all"));
 }
 
 uint32_t FindParam(const EffectDescriptor& effect, std::string_view text) {
@@ -247,9 +253,9 @@ uint32_t FindParam(const EffectDescriptor& effect, std::string_view text) {
     if (names.empty()) {
         throw CUsageError(ShortName(effect) + " has no parameters");
     }
-    throw CUsageError(ShortName(effect) + " has no parameter " + Quoted(text) +
-                      "; the nearest is " + Quoted(Nearest(text, names)) + " (kyvhost info " +
-                      ShortName(effect) + " shows all)");
+    throw CUsageError(
+        ShortName(effect) + " has no parameter " + Quoted(text) +
+        WithNearest(Nearest(text, names), "kyvhost info " + ShortName(effect) + " shows all"));
 }
 
 } // namespace kyvhost

@@ -28,17 +28,24 @@ size_t EditDistance(std::string_view a, std::string_view b) {
     return row[b.size()];
 }
 
+namespace {
+
+// Of the letters, how many may differ: beyond half of them a name is another name.
+constexpr double kFarthest = 0.5;
+
+} // namespace
+
 std::string Nearest(std::string_view text, const std::vector<std::string>& candidates) {
     const std::string wanted = Normalized(text);
     std::string nearest;
-    double best = 2;
+    double best = kFarthest;
     for (const std::string& candidate : candidates) {
         // Against the length, or short keys would be near to everything.
         const std::string name = Normalized(candidate);
         const size_t length = std::max({wanted.size(), name.size(), size_t{1}});
         const double distance =
             static_cast<double>(EditDistance(wanted, name)) / static_cast<double>(length);
-        if (distance < best) {
+        if (distance < best || (distance == best && nearest.empty())) {
             best = distance;
             nearest = candidate;
         }

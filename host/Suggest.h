@@ -11,7 +11,7 @@ namespace kyvhost {
 size_t EditDistance(std::string_view a, std::string_view b);
 
 // The candidate with the least share of letters to change to make it text, both Normalized; the
-// first of several, empty for no candidates.
+// first of several, empty when none is near.
 std::string Nearest(std::string_view text, const std::vector<std::string>& candidates);
 
 } // namespace kyvhost

@@ -3,6 +3,13 @@
 
 namespace kyvhost {
 
+bool IsWholeNumber(std::string_view text) {
+    if (text.starts_with('-') || text.starts_with('+')) {
+        text.remove_prefix(1);
+    }
+    return !text.empty() && text.find_first_not_of("0123456789") == std::string_view::npos;
+}
+
 std::string Lower(std::string_view text) {
     std::string lower(text);
     for (char& letter : lower) {

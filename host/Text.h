@@ -21,6 +21,9 @@ inline std::string Quoted(std::string_view text) {
     return "\"" + std::string(text) + "\"";
 }
 
+// Digits behind at most a sign, however many.
+bool IsWholeNumber(std::string_view text);
+
 // ASCII only, whatever the locale.
 std::string Lower(std::string_view text);
 

@@ -1,10 +1,10 @@
 // Parameter values as text.
 #include "host/Values.h"
 
+#include <cfloat>
 #include <charconv>
 #include <cmath>
 #include <cstring>
-#include <limits>
 #include <optional>
 
 #include "host/ExitStatus.h"
@@ -85,12 +85,14 @@ std::string Wanted(const ParamDescriptor& param) {
 }
 
 std::optional<double> ParseAnyNumber(const ParamDescriptor& param, std::string_view text) {
-    if (param.type == ParamType_Float) {
-        const auto number = ParseNumber<float>(text);
-        return number && std::isfinite(*number) ? std::optional<double>(*number) : std::nullopt;
+    if (param.type != ParamType_Float && !IsWholeNumber(text)) {
+        return std::nullopt;
     }
-    const auto number = ParseNumber<int32_t>(text);
-    return number ? std::optional<double>(*number) : std::nullopt;
+    if (const auto number = ParseNumber<float>(text);
+        number && param.type == ParamType_Float) { // rounded once
+        return std::isfinite(*number) ? std::optional<double>(*number) : std::nullopt;
+    }
+    return ParseNumber<double>(text);
 }
 
 void StoreNumber(const ParamDescriptor& param, double number, void* value) {
@@ -325,12 +327,14 @@ void ParseValue(const ParamDescriptor& param, std::string_view name, std::string
     if (!number) {
         throw CUsageError(std::string(name) + ": " + Quoted(text) + " is not " + Wanted(param));
     }
-    const double least = HasRange(param)                ? NumberOf(param, param.minimum)
-                         : param.type == ParamType_Byte ? 0
-                                                        : -std::numeric_limits<double>::max();
-    const double most = HasRange(param)                ? NumberOf(param, param.maximum)
-                        : param.type == ParamType_Byte ? 255
-                                                       : std::numeric_limits<double>::max();
+    const double least = HasRange(param)                 ? NumberOf(param, param.minimum)
+                         : param.type == ParamType_Byte  ? 0
+                         : param.type == ParamType_Float ? -FLT_MAX
+                                                         : INT32_MIN;
+    const double most = HasRange(param)                 ? NumberOf(param, param.maximum)
+                        : param.type == ParamType_Byte  ? 255
+                        : param.type == ParamType_Float ? FLT_MAX
+                                                        : INT32_MAX;
     if (*number < least || *number > most) {
         throw CUsageError(std::string(name) + ": " + std::string(text) +
                           " is out of range: " + RangeText(param));
