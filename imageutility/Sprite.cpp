@@ -4,6 +4,7 @@
 
 #include "imageutility/ImageUtility.h"
 #include "imageutility/RowWalk.h"
+#include "platform/Truncate.h"
 
 namespace KYVImageUtility {
 namespace {
@@ -15,17 +16,10 @@ struct SpriteRect {
     int32_t h;
 };
 
-// Truncates; what 32 bits cannot hold becomes the nearest number that they can.
-int32_t Truncate(float value) {
-    if (value >= 2147483648.0F) {
-        return INT32_MAX;
-    }
-    return value <= -2147483648.0F ? INT32_MIN : static_cast<int32_t>(value);
-}
-
 // trunc(pixels / length * spriteLength) in single precision; pixels is 0..length.
 int32_t InSprite(float pixels, int32_t length, int32_t spriteLength) {
-    return Truncate(pixels / static_cast<float>(length) * static_cast<float>(spriteLength));
+    return kyv::TruncateToInt(pixels / static_cast<float>(length) *
+                              static_cast<float>(spriteLength));
 }
 
 // How far a rectangle begins outside, left of or above the canvas.
@@ -89,7 +83,8 @@ void CImageARGB::DrawSprite(const CImageARGB& sprite, int32_t mode, float x, flo
         std::isnan(w) || std::isnan(h)) {
         return;
     }
-    const SpriteRect rect = {Truncate(x), Truncate(y), Truncate(w), Truncate(h)};
+    const SpriteRect rect = {kyv::TruncateToInt(x), kyv::TruncateToInt(y), kyv::TruncateToInt(w),
+                             kyv::TruncateToInt(h)};
     CImageARGB view;
     if (GetSubImage(view, rect.x, rect.y, rect.w, rect.h) == 0 || !HasPixels(view)) {
         return;

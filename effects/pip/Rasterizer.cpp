@@ -70,13 +70,6 @@ private:
 
 std::mutex CRasterLock::s_mutex;
 
-int32_t TruncateToInt(float value) {
-    if (!(value > -0x1p31F)) {
-        return value <= -0x1p31F ? INT32_MIN : 0;
-    }
-    return value < 0x1p31F ? static_cast<int32_t>(value) : INT32_MAX;
-}
-
 void CRasterizer::SetPixelCallback(RasterPixelCallback callback) {
     g_callback = callback;
 }

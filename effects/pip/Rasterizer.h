@@ -15,6 +15,8 @@
 #include <cstdint>
 #include <mutex>
 
+#include "platform/Truncate.h"
+
 namespace kyv {
 
 struct RasterPoint {
@@ -102,9 +104,6 @@ public:
     // The outline of an ellipse by its half axes; nothing when one is negative or beyond 2^19.
     static void DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX, int32_t radiusY);
 };
-
-// Toward zero; the nearest end of the range beyond 32 bits, and 0 for what is not a number.
-int32_t TruncateToInt(float value);
 
 inline RasterPoint Truncate(const RasterPointF& point) {
     return {TruncateToInt(point.x), TruncateToInt(point.y)};
