@@ -205,7 +205,7 @@ void Gallery(const ModuleDescriptor& module, const GalleryOptions& options) {
     for (uint32_t i = 0; i < module.effectCount; ++i) {
         sheet.Add(RenderTile(module.effects[i], options.settings, a, b));
     }
-    WritePng(sheet.Finished(), output.Temporary());
+    WritePng(sheet.Finished(), output.Temporary(), output.Name());
     output.Commit();
 }
 

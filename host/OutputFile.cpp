@@ -1,7 +1,10 @@
 // Results appear whole or not at all.
 #include "host/OutputFile.h"
 
+#include <cerrno>
+#include <fstream>
 #include <random>
+#include <system_error>
 
 #include "host/ExitStatus.h"
 #include "host/Hex.h"
@@ -12,29 +15,58 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// Random, so that two runs do not write one file.
-fs::path TemporaryName(const fs::path& file) {
-    fs::path name = file.stem();
+[[noreturn]] void Unwritable(const fs::path& file, const std::string& why) {
+    throw CHostError(ExitStatus::RenderingFailed, TextOf(file) + " cannot be written: " + why);
+}
+
+// Where a symbolic link leads, so that the link stays one.
+fs::path TargetOf(const fs::path& file) {
+    constexpr int kMostLinks = 40;
+    fs::path target = file;
+    std::error_code error;
+    for (int i = 0; i < kMostLinks && fs::is_symlink(target, error); ++i) {
+        const fs::path next = fs::read_symlink(target, error);
+        target = target.parent_path() / next; // an absolute one replaces all
+    }
+    return target;
+}
+
+// Random, so that two runs do not write one file. The extension tells the kind of file.
+fs::path TemporaryName(const fs::path& target, const fs::path& extension) {
+    fs::path name = target.stem();
     name += ".part-" + Hex(std::random_device()()).substr(2);
-    name += file.extension();
-    return file.parent_path() / name;
+    name += extension;
+    return target.parent_path() / name;
 }
 
 } // namespace
 
 COutputFile::COutputFile(const fs::path& file)
-    : m_file(file), m_temporary(TemporaryName(file)), m_guard([name = m_temporary] {
+    : m_file(file), m_target(TargetOf(file)),
+      m_temporary(TemporaryName(m_target, file.extension())), m_guard([name = m_temporary] {
           std::error_code error;
           fs::remove(name, error);
       }) {
     std::error_code error;
-    const fs::path folder = fs::absolute(file).parent_path();
-    if (!fs::is_directory(folder, error)) {
-        throw CUsageError(TextOf(file) + ": the folder " + TextOf(folder) + " does not exist");
+    const fs::path folder = fs::absolute(m_target).parent_path();
+    if (!fs::exists(folder, error)) {
+        Unwritable(file, "the folder " + TextOf(folder) + " does not exist");
     }
-    if (fs::is_directory(file, error)) {
-        throw CUsageError(TextOf(file) + " is a folder; name a file for the result");
+    if (fs::is_symlink(m_target, error)) {
+        Unwritable(file, "its links lead in a circle");
     }
+    if (fs::is_directory(m_target, error)) {
+        Unwritable(file, "it is a folder; name a file for the result");
+    }
+    if (fs::exists(m_target, error) && !fs::is_regular_file(m_target, error)) {
+        Unwritable(file, "it is no regular file");
+    }
+    // Better now than after an hour of rendering.
+    errno = 0;
+    if (!std::ofstream(m_temporary, std::ios::binary)) {
+        Unwritable(file, std::generic_category().message(errno));
+    }
+    fs::remove(m_temporary, error);
 }
 
 COutputFile::~COutputFile() {
@@ -44,11 +76,9 @@ COutputFile::~COutputFile() {
 
 void COutputFile::Commit() {
     std::error_code error;
-    fs::rename(m_temporary, m_file, error);
+    fs::rename(m_temporary, m_target, error);
     if (error) {
-        throw CHostError(ExitStatus::RenderingFailed,
-                         TextOf(m_file) +
-                             ": the result cannot be given this name: " + error.message());
+        Unwritable(m_file, error.message());
     }
 }
 

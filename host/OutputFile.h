@@ -11,12 +11,15 @@ namespace kyvhost {
 // removed at the end, on failure and on interruption.
 class COutputFile {
 public:
-    // Throws CUsageError when the folder does not exist or the name is a folder's.
+    // A symbolic link stands for its target. Throws CHostError when nothing can be written there.
     explicit COutputFile(const std::filesystem::path& file);
     ~COutputFile();
 
     COutputFile(const COutputFile&) = delete;
     COutputFile& operator=(const COutputFile&) = delete;
+
+    // What the user has named.
+    const std::filesystem::path& Name() const { return m_file; }
 
     const std::filesystem::path& Temporary() const { return m_temporary; }
 
@@ -24,7 +27,7 @@ public:
     void Commit();
 
 private:
-    std::filesystem::path m_file;
+    std::filesystem::path m_file, m_target; // what the user has named, and where it leads
     std::filesystem::path m_temporary;
     CInterruptGuard m_guard;
 };

@@ -2,9 +2,11 @@
 #include "host/Picture.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cstring>
 #include <fstream>
 #include <memory>
+#include <system_error>
 
 #include <stb/stb_image.h>
 #include <stb/stb_image_resize.h>
@@ -174,9 +176,10 @@ Picture ReadPicture(const fs::path& file) {
     return orientation == 1 ? picture : Upright(picture, orientation);
 }
 
-void WritePng(const Picture& picture, const fs::path& file) {
+void WritePng(const Picture& picture, const fs::path& file, const fs::path& shown) {
     std::vector<uint8_t> pixels = picture.pixels;
     SwapRedBlue(pixels);
+    errno = 0;
     std::ofstream stream(file, std::ios::binary | std::ios::trunc);
     const auto write = [](void* context, void* data, int size) {
         static_cast<std::ofstream*>(context)->write(static_cast<const char*>(data), size);
@@ -186,8 +189,8 @@ void WritePng(const Picture& picture, const fs::path& file) {
                                             static_cast<int>(picture.width * 4));
     stream.close();
     if (!done || !stream) {
-        throw CHostError(ExitStatus::RenderingFailed,
-                         TextOf(file) + ": the picture cannot be written");
+        const std::string why = errno ? ": " + std::generic_category().message(errno) : "";
+        throw CHostError(ExitStatus::RenderingFailed, TextOf(shown) + " cannot be written" + why);
     }
 }
 

@@ -22,8 +22,9 @@ bool IsPictureFile(const std::filesystem::path& file);
 // missing, broken or cut off.
 Picture ReadPicture(const std::filesystem::path& file);
 
-// Throws CHostError with RenderingFailed.
-void WritePng(const Picture& picture, const std::filesystem::path& file);
+// Throws CHostError with RenderingFailed, which names the file as shown.
+void WritePng(const Picture& picture, const std::filesystem::path& file,
+              const std::filesystem::path& shown);
 
 Picture Resized(const Picture& picture, uint32_t width, uint32_t height);
 

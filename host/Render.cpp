@@ -246,7 +246,7 @@ void CRendering::RenderStill(const fs::path& file) {
     if (m_options.settings.ayuv) {
         AyuvToBgra(result.pixels.data(), m_shape.Pixels());
     }
-    WritePng(result, file);
+    WritePng(result, file, m_options.output);
 }
 
 Rational CRendering::ClipRate() const {

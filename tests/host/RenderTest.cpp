@@ -243,6 +243,7 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
         std::string bytes(std::istreambuf_iterator<char>(whole), {});
         std::ofstream(Path("cut.png"), std::ios::binary) << bytes.substr(0, bytes.size() - 20);
     }
+    std::filesystem::create_directory(Path("folder.png"));
     const std::vector<std::string> files = Files();
     const std::string probe = ProbeModule();
     struct Case {
@@ -294,7 +295,9 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
         {{"render", "6", in, out}, 2, {"two inputs", "--input2"}},
         {{"render", "11", in, out, "--input2", in}, 2, {"one input"}},
         {{"render", "11", in, Path("out.gif")}, 2, {"out.gif", ".png", ".mp4"}},
-        {{"render", "11", in, Path("none/out.png")}, 2, {"none", "does not exist"}},
+        {{"render", "11", in, Path("none/out.png")}, 1, {"none", "does not exist"}},
+        {{"render", "11", in, Path("folder.png")}, 1, {"folder.png cannot be written", "folder;"}},
+        {{"render", "11", in, in + "/out.png"}, 1, {"in.png/out.png cannot be written: "}},
         {{"render", "11", Path("none.png"), out}, 3, {"none.png", "no such file"}},
         {{"render", "11", Path("text.png"), out}, 3, {"text.png", "no PNG or JPEG"}},
         {{"render", "11", Path("empty.jpg"), out}, 3, {"empty.jpg", "empty"}},
@@ -335,6 +338,19 @@ TEST_F(RenderTest, AFailureKeepsTheOldResult) {
 }
 
 #ifndef _WIN32
+TEST_F(RenderTest, AResultGoesWhereALinkLeads) {
+    const std::string in = Write("in.png", 3, Ramp(3, 2));
+    std::filesystem::create_directory(Path("folder"));
+    std::filesystem::create_symlink("folder/real.data", Path("link.png"));
+    const HostResult result = RunHost({"render", "11", in, Path("link.png")});
+    EXPECT_EQ(result.status, 0) << result.error;
+    EXPECT_TRUE(std::filesystem::is_symlink(Path("link.png")));
+    EXPECT_EQ(Read("folder/real.data").size(), 6U);
+    std::filesystem::create_symlink("loop.png", Path("loop.png"));
+    EXPECT_EQ(RunHost({"render", "11", in, Path("loop.png")}).status, 1);
+    EXPECT_TRUE(std::filesystem::is_symlink(Path("loop.png")));
+}
+
 TEST_F(RenderTest, OutputThatIsLostIsAFailure) {
     for (const char* arguments :
          {"list", "info bubble --json", "--help", "bench 11 --size 8x8 --frames 1"}) {
