@@ -24,6 +24,8 @@
 namespace kyvhost {
 namespace {
 
+namespace fs = std::filesystem;
+
 constexpr const char* kFooter =
     R"(Effects are named by short name, identifier or number, parameters by key or name.
 
@@ -84,6 +86,13 @@ void FlushOutput() {
     if (std::fflush(stdout) != 0 || std::ferror(stdout) || !std::cout) {
         throw CHostError(ExitStatus::RenderingFailed, "the standard output cannot be written");
     }
+}
+
+fs::path ParsePath(std::string_view what, std::string_view text) {
+    if (text.empty()) {
+        throw CUsageError(std::string(what) + " is empty: name a file");
+    }
+    return PathOf(text);
 }
 
 class CCommandLine {
@@ -221,7 +230,7 @@ private:
         AddText(
             verb, "--input2", "FILE",
             "the second input of a transition, or the inner picture; takes the first one's size",
-            [this](const std::string& text) { m_render.input2 = PathOf(text); });
+            [this](const std::string& text) { m_render.input2 = ParsePath("--input2", text); });
         AddSettings(verb);
         AddLevel(verb);
         verb->add_option("--animate", m_render.animations,
@@ -235,10 +244,15 @@ private:
                 [this](const std::string& text) { m_render.time = ParseTime("--time", text); });
         AddText(verb, "--start", "TIME", "where in the videos to begin",
                 [this](const std::string& text) { m_render.start = ParseTime("--start", text); });
-        AddText(
-            verb, "--duration", "TIME",
-            "length of the clip; default: the shortest video's, or 10s for pictures",
-            [this](const std::string& text) { m_render.duration = ParseTime("--duration", text); });
+        AddText(verb, "--duration", "TIME",
+                "length of the clip; default: the shortest video's, or 10s for pictures",
+                [this](const std::string& text) {
+                    m_render.duration = ParseTime("--duration", text);
+                    if (*m_render.duration == 0) {
+                        throw CUsageError("--duration: " + text +
+                                          " is out of range: it is above 0");
+                    }
+                });
         AddText(
             verb, "--overlap", "TIME",
             "play the first video, the effect for so long, then the rest of the second",
@@ -267,7 +281,9 @@ private:
                                          : VideoCodec::Ffv1;
                 });
         AddText(verb, "--ffmpeg", "FILE", "the program ffmpeg; ffprobe lies beside it",
-                [this](const std::string& text) { m_render.tools.ffmpeg = text; });
+                [this](const std::string& text) {
+                    m_render.tools.ffmpeg = TextOf(ParsePath("--ffmpeg", text));
+                });
         verb->add_flag("--quiet,-q", m_render.quiet, "no progress, no notes");
     }
 
@@ -311,7 +327,7 @@ private:
     }
 
     CModule Load() const {
-        return CModule(m_module.empty() ? DefaultModuleFile() : PathOf(m_module));
+        return CModule(m_module ? ParsePath("--module", *m_module) : DefaultModuleFile());
     }
 
     void List() {
@@ -327,8 +343,8 @@ private:
 
     void RenderFile() {
         m_render.effect = m_effect;
-        m_render.input = PathOf(m_input);
-        m_render.output = PathOf(m_output);
+        m_render.input = ParsePath("INPUT", m_input);
+        m_render.output = ParsePath("OUTPUT", m_output);
         const CModule module = Load();
         Render(module.Descriptor(), m_render);
     }
@@ -342,9 +358,9 @@ private:
     }
 
     void MakeGallery() {
-        m_gallery.input = PathOf(m_input);
-        m_gallery.input2 = PathOf(m_input2);
-        m_gallery.output = PathOf(m_output);
+        m_gallery.input = ParsePath("INPUT", m_input);
+        m_gallery.input2 = ParsePath("INPUT2", m_input2);
+        m_gallery.output = ParsePath("OUTPUT", m_output);
         m_gallery.settings = m_render.settings;
         const CModule module = Load();
         Gallery(module.Descriptor(), m_gallery);
@@ -391,7 +407,8 @@ private:
 
     CLI::App m_app;
     std::function<void()> m_action = [] {};
-    std::string m_module, m_effect, m_input, m_input2, m_output;
+    std::optional<std::string> m_module;
+    std::string m_effect, m_input, m_input2, m_output;
     bool m_bJson = false;
     RenderOptions m_render;
     BenchOptions m_bench;

@@ -13,10 +13,17 @@ constexpr size_t kLinesKept = 8;
 
 // Shells the system's error: "cannot be started" is what the user has to mend.
 template <class Start>
-auto Started(const std::string& program, ExitStatus status, Start&& start) {
+auto Started(const std::string& program, const std::string& option, ExitStatus status,
+             Start&& start) {
     try {
         return start();
     } catch (const std::system_error& error) {
+        if (!option.empty()) {
+            throw CUsageError(
+                "--ffmpeg: " + Quoted(option) +
+                (program == option ? " cannot be started (" : " has no ffprobe beside it (") +
+                error.code().message() + ")");
+        }
         throw CHostError(status, "videos need " + program + ", which cannot be started (" +
                                      error.code().message() +
                                      "); install ffmpeg or name it with --ffmpeg FILE");
@@ -25,9 +32,10 @@ auto Started(const std::string& program, ExitStatus status, Start&& start) {
 
 } // namespace
 
-CFfmpeg::CFfmpeg(const std::string& program, const std::vector<std::string>& arguments,
-                 kyv::ChildStream input, kyv::ChildStream output, ExitStatus status)
-    : m_process(Started(program, status,
+CFfmpeg::CFfmpeg(const std::string& program, const std::string& option,
+                 const std::vector<std::string>& arguments, kyv::ChildStream input,
+                 kyv::ChildStream output, ExitStatus status)
+    : m_process(Started(program, option, status,
                         [&] {
                             return kyv::CProcess(program, arguments, input, output,
                                                  kyv::ChildStream::Pipe);

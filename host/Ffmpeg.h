@@ -15,9 +15,11 @@ namespace kyvhost {
 
 class CFfmpeg {
 public:
-    // status: that of the error when the program cannot be started.
-    CFfmpeg(const std::string& program, const std::vector<std::string>& arguments,
-            kyv::ChildStream input, kyv::ChildStream output, ExitStatus status);
+    // option: what the user has named the program by; empty when it is the installed one. status:
+    // that of the error when the installed one cannot be started; a bad option is wrong use.
+    CFfmpeg(const std::string& program, const std::string& option,
+            const std::vector<std::string>& arguments, kyv::ChildStream input,
+            kyv::ChildStream output, ExitStatus status);
     ~CFfmpeg();
 
     kyv::CProcess& Process() { return m_process; }

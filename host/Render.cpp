@@ -221,14 +221,14 @@ void CRendering::RenderStill(const fs::path& file) {
     const Source& first = m_sources.front();
     double duration = m_options.duration.value_or(0);
     if (!m_options.duration) {
-        duration = !first.isPicture && first.video.frameCount > 0
-                       ? SecondsOf(first.video)
-                       : std::max(kStillClipSeconds, 2 * m_options.time.value_or(0));
+        duration = !first.isPicture && first.video.frameCount > 0 ? SecondsOf(first.video)
+                                                                  : kStillClipSeconds;
     }
     const double time = m_options.time.value_or(duration / 2);
     if (time > duration) {
         throw CUsageError("--time: " + SecondsText(time) + " is out of range: the clip lasts " +
-                          SecondsText(duration));
+                          SecondsText(duration) +
+                          (m_options.duration ? "" : "; --duration sets another length"));
     }
     std::vector<Frame> frames;
     for (const Source& source : m_sources) {
@@ -420,10 +420,16 @@ Timeline CRendering::JoinedTimeline(const Rational& rate) const {
     if (m_options.start || m_options.duration) {
         throw CUsageError("--overlap joins whole clips; it does not go with --start or --duration");
     }
+    if (m_sources.size() != 2) {
+        throw CUsageError("--overlap joins two videos, and " + ShortName(m_effect) +
+                          " takes one input");
+    }
     int64_t frames[2] = {};
     for (size_t i = 0; i < 2; ++i) {
-        if (m_sources.size() != 2 || m_sources[i].isPicture || m_sources[i].video.frameCount == 0) {
-            throw CUsageError("--overlap joins two videos that tell their lengths");
+        if (m_sources[i].isPicture || m_sources[i].video.frameCount == 0) {
+            throw CUsageError(
+                "--overlap joins two videos, and " + TextOf(m_sources[i].file) +
+                (m_sources[i].isPicture ? " is a picture" : " does not tell its length"));
         }
         frames[i] = std::llround(SecondsOf(m_sources[i].video) * rate.Value());
     }

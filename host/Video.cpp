@@ -277,7 +277,7 @@ std::string VideoTools::Ffprobe() const {
 }
 
 VideoInfo ProbeVideo(const VideoTools& tools, const fs::path& file) {
-    CFfmpeg probe(tools.Ffprobe(),
+    CFfmpeg probe(tools.Ffprobe(), tools.Option(),
                   {"-v", "error", "-print_format", "json", "-show_streams", "-show_format",
                    FileArgument(file)},
                   ChildStream::Null, ChildStream::Pipe, ExitStatus::InputUnreadable);
@@ -315,8 +315,9 @@ CVideoReader::CVideoReader(const VideoTools& tools, const fs::path& file, const 
                      {"-i", FileArgument(file), "-map", "0:" + std::to_string(info.streamIndex),
                       "-vf", "fps=" + TextOf(rate) + "," + scale, "-f", "rawvideo", "-pix_fmt",
                       "bgra", "pipe:1"});
-    m_pFfmpeg = std::make_unique<CFfmpeg>(tools.ffmpeg, arguments, ChildStream::Null,
-                                          ChildStream::Pipe, ExitStatus::InputUnreadable);
+    m_pFfmpeg =
+        std::make_unique<CFfmpeg>(tools.ffmpeg, tools.Option(), arguments, ChildStream::Null,
+                                  ChildStream::Pipe, ExitStatus::InputUnreadable);
 }
 
 CVideoReader::~CVideoReader() = default;
@@ -374,9 +375,9 @@ std::vector<std::string> RecodedAudio(const fs::path& file,
 
 CVideoWriter::CVideoWriter(const VideoTools& tools, const fs::path& file, const VideoFormat& format)
     : m_file(file), m_frameBytes(size_t{format.width} * format.height * 4),
-      m_pFfmpeg(std::make_unique<CFfmpeg>(tools.ffmpeg, WriterArguments(file, format),
-                                          ChildStream::Pipe, ChildStream::Null,
-                                          ExitStatus::RenderingFailed)) {}
+      m_pFfmpeg(std::make_unique<CFfmpeg>(tools.ffmpeg, tools.Option(),
+                                          WriterArguments(file, format), ChildStream::Pipe,
+                                          ChildStream::Null, ExitStatus::RenderingFailed)) {}
 
 CVideoWriter::~CVideoWriter() = default;
 

@@ -17,6 +17,9 @@ namespace kyvhost {
 struct VideoTools {
     std::string ffmpeg = "ffmpeg";
 
+    // The user's choice; empty for the installed one.
+    std::string Option() const { return ffmpeg == "ffmpeg" ? "" : ffmpeg; }
+
     std::string Ffprobe() const;
 };
 

@@ -212,7 +212,8 @@ TEST_F(VideoTest, ErrorsLeaveNothing) {
     const Case cases[] = {
         {{"text.mp4", out}, 3, "text.mp4"},
         {{"cut.mkv", out}, 3, "cut.mkv"},
-        {{"in.mkv", out, "--ffmpeg", "/none/ffmpeg"}, 3, "--ffmpeg"},
+        {{"in.mkv", out, "--ffmpeg", "/none/ffmpeg"}, 2, "--ffmpeg: \"/none/ffmpeg\""},
+        {{"in.mkv", out, "--overlap", "1"}, 2, "and probe takes one input"},
         {{"in.mkv", Path("out.mp4"), "--codec", "ffv1"}, 2, ".mkv"},
         {{"in.mkv", out, "--start", "1m"}, 2, "\"1m\""},
         {{"in.mkv", out, "--start", "1"}, 2, "lasts 0.3"},
