@@ -21,7 +21,8 @@ void Leave() {
     for (auto action = g_actions.rbegin(); action != g_actions.rend(); ++action) {
         (*action)();
     }
-    std::fprintf(stderr, "%skyvhost: interrupted\n", CProgress::IsLineOpen() ? "\n" : "");
+    CProgress::CloseLine();
+    std::fputs("kyvhost: interrupted\n", stderr);
     std::_Exit(static_cast<int>(ExitStatus::Interrupted));
 }
 

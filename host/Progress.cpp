@@ -42,7 +42,11 @@ CProgress::CProgress(int64_t total, bool quiet)
 }
 
 CProgress::~CProgress() {
-    if (s_bLineOpen) {
+    CloseLine();
+}
+
+void CProgress::CloseLine() {
+    if (s_bLineOpen.exchange(false)) {
         std::fputc('\n', stderr);
     }
 }

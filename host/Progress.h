@@ -25,8 +25,8 @@ public:
     // The last line: frames, time and rate.
     void Finish(int64_t done);
 
-    // Whether the bar stands on a terminal without an end of line. From any thread.
-    static bool IsLineOpen() { return s_bLineOpen; }
+    // Ends the line where a bar stands on a terminal. From any thread; once for each bar.
+    static void CloseLine();
 
 private:
     using Clock = std::chrono::steady_clock;
