@@ -204,7 +204,7 @@ const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_v
             parts.push_back(ShortName(effect));
         }
     }
-    if (parts.size() == 1) {
+    if (found && parts.size() == 1) {
         return *found;
     }
     if (parts.size() > 1) {
