@@ -61,6 +61,14 @@ DisplaySize GetDisplaySize(const EffectContext& context, const FrameGeometry& ge
     return {width, height, false};
 }
 
+KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,
+                                   void* frame) {
+    KYVImageUtility::CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset,
+                                     geometry.width, geometry.height, geometry.pitchBytes);
+    view.SetCpuLevel(context.cpuLevel);
+    return view;
+}
+
 void CopyView(const FrameGeometry& geometry, void* output, const void* input) {
     if (output == input) {
         return;

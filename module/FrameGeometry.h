@@ -4,6 +4,7 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "imageutility/ImageUtility.h"
 #include "module/HostInterface.h"
 
 namespace kyv {
@@ -43,6 +44,11 @@ enum class KeptSide {
 // large picture, counts as the view's own.
 DisplaySize GetDisplaySize(const EffectContext& context, const FrameGeometry& geometry,
                            KeptSide kept);
+
+// The view of the call in one of the host's frames, as an image of the context's level. Its bytes
+// are those of the frame's format.
+KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,
+                                   void* frame);
 
 // Copies the view of the call from one frame to another of the same geometry. The frames may be
 // one and the same, but must not overlap otherwise.

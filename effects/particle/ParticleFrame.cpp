@@ -76,13 +76,6 @@ CanvasSize ChooseCanvasSize(const EffectContext& context, const FrameGeometry& g
     return {size.width, size.height};
 }
 
-CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry, void* frame) {
-    CImageARGB view(ViewStart(geometry, frame), geometry.width, geometry.height,
-                    geometry.pitchBytes);
-    view.SetCpuLevel(context.cpuLevel);
-    return view;
-}
-
 CParticleCanvas::CParticleCanvas(const EffectContext& context, const FrameGeometry& geometry,
                                  CanvasSize size, Pixels pixels)
     : m_bConverted(pixels == Pixels::Argb && context.pixelFormat == PixelFormat_Ayuv),

@@ -93,8 +93,4 @@ void DrawAnimation(const EffectContext& context, const FrameGeometry& geometry,
                    const PreviewSpan& preview, const void* input, CParticleCanvas& canvas,
                    CParticleFxBase& particles);
 
-// The call's view of a frame of the host's, as it comes.
-KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,
-                                   void* frame);
-
 } // namespace kyv

@@ -121,13 +121,6 @@ RasterWindow BoundCorners(const RasterPoint (&corners)[4]) {
     return box;
 }
 
-CImageARGB ViewOf(void* frame, const FrameGeometry& geometry, int32_t cpuLevel) {
-    CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
-                    geometry.height, geometry.pitchBytes);
-    view.SetCpuLevel(cpuLevel);
-    return view;
-}
-
 // The output's rows. Those of a field that the call does not treat are left as they are.
 class COutput final : public CRowSink {
 public:
@@ -362,8 +355,8 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     if (!instance.background || !context.frame || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CImageARGB output = ViewOf(context.frame, geometry, context.cpuLevel);
-    const CImageARGB background = ViewOf(instance.background, geometry, context.cpuLevel);
+    const CImageARGB output = ViewOf(context, geometry, context.frame);
+    const CImageARGB background = ViewOf(context, geometry, instance.background);
     COutput rows(context, output, background);
     if (!instance.foreground) {
         rows.CopyRows(0, geometry.height);
@@ -373,7 +366,7 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     const Settings settings = ReadSettings(context, geometry, ayuv);
     Prepare(instance);
     CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
-    work.Render(ViewOf(instance.foreground, geometry, context.cpuLevel), rows,
+    work.Render(ViewOf(context, geometry, instance.foreground), rows,
                 instance.foreground == context.frame);
     return KYV_OK;
 }

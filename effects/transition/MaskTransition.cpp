@@ -22,13 +22,6 @@ constexpr int32_t kRed = 2;
 constexpr int32_t kBilinear = 0;
 constexpr int32_t kLeastScalable = 2; // pixels each way
 
-CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry, void* frame) {
-    CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset, geometry.width,
-                    geometry.height, geometry.pitchBytes);
-    view.SetCpuLevel(context.cpuLevel);
-    return view;
-}
-
 MaskBlendParams ReadParams(const EffectContext& context) {
     const CParamReader reader(context);
     const uint32_t color = reader.Color(2);
