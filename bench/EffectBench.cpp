@@ -9,7 +9,7 @@
 #include <filesystem>
 #include <memory>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 #include "platform/Library.h"
 
 namespace kyvbench {

@@ -1,7 +1,7 @@
 // The parts of the pass-through effect that need no template.
 #include "effects/PassThrough.h"
 
-#include "module/FrameGeometry.h"
+#include "interface/FrameGeometry.h"
 
 namespace kyv {
 

@@ -1,7 +1,7 @@
 // An effect that obeys the whole calling protocol and copies its first input to the output.
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -1,6 +1,6 @@
 // A complete host for Linux: warms one picture of four pixels with the colour temperature.
 // Build: cc -I. examples/minimal_host.c -ldl. Run: ./a.out path/to/libKyvDsp.so
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 #include <dlfcn.h>
 #include <stdio.h>

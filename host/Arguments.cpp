@@ -6,8 +6,8 @@
 #include <numeric>
 #include <optional>
 
-#include "host/ExitStatus.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

@@ -12,7 +12,7 @@
 #include <nlohmann/json.hpp>
 
 #include "host/Clip.h"
-#include "host/Names.h"
+#include "hosting/Names.h"
 
 namespace kyvhost {
 namespace {

@@ -5,10 +5,10 @@
 
 #include <nlohmann/json.hpp>
 
-#include "host/Instance.h"
-#include "host/Names.h"
-#include "host/Text.h"
-#include "host/Values.h"
+#include "hosting/Instance.h"
+#include "hosting/Names.h"
+#include "hosting/Text.h"
+#include "hosting/Values.h"
 
 namespace kyvhost {
 namespace {

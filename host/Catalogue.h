@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "host/Module.h"
+#include "hosting/Module.h"
 
 namespace kyvhost {
 

@@ -7,9 +7,9 @@
 #include <thread>
 
 #include "host/FrameQueue.h"
-#include "host/Instance.h"
 #include "host/Picture.h"
 #include "host/Video.h"
+#include "hosting/Instance.h"
 
 namespace kyvhost {
 

@@ -15,11 +15,11 @@
 #include "host/Bench.h"
 #include "host/Catalogue.h"
 #include "host/Gallery.h"
-#include "host/Module.h"
-#include "host/Names.h"
 #include "host/Render.h"
-#include "host/Suggest.h"
-#include "host/Text.h"
+#include "hosting/Module.h"
+#include "hosting/Names.h"
+#include "hosting/Suggest.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

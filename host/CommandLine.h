@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "host/ExitStatus.h"
+#include "hosting/ExitStatus.h"
 
 namespace kyvhost {
 

@@ -4,7 +4,7 @@
 #include <system_error>
 #include <utility>
 
-#include "host/Text.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

@@ -7,12 +7,12 @@
 
 #include "host/AyuvFrame.h"
 #include "host/Clip.h"
-#include "host/ExitStatus.h"
 #include "host/Lettering.h"
-#include "host/Names.h"
 #include "host/OutputFile.h"
 #include "host/Picture.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Names.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

@@ -6,9 +6,9 @@
 #include <random>
 #include <system_error>
 
-#include "host/ExitStatus.h"
-#include "host/Hex.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Hex.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

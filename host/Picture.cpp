@@ -12,8 +12,8 @@
 #include <stb/stb_image_resize.h>
 #include <stb/stb_image_write.h>
 
-#include "host/ExitStatus.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

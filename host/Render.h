@@ -8,9 +8,9 @@
 #include <vector>
 
 #include "host/Arguments.h"
-#include "host/Easing.h"
-#include "host/Instance.h"
 #include "host/Video.h"
+#include "hosting/Easing.h"
+#include "hosting/Instance.h"
 
 namespace kyvhost {
 

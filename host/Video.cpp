@@ -8,9 +8,9 @@
 
 #include <nlohmann/json.hpp>
 
-#include "host/ExitStatus.h"
 #include "host/Ffmpeg.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

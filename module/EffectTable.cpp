@@ -12,7 +12,7 @@
 #include "effects/style/LightRay.h"
 #include "effects/style/PencilSketch.h"
 #include "effects/transition/TransitionEffects.h"
-#include "module/EffectGlue.h"
+#include "interface/EffectGlue.h"
 #include "module/Module.h"
 #include "module/ParamTables.h"
 

@@ -1,7 +1,7 @@
 // The descriptor records of the twelve effects, in the order in which the host enumerates them.
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

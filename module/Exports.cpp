@@ -1,5 +1,5 @@
 // The two functions that the library exports.
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 #include "module/Module.h"
 #include "module/ResourceLibrary.h"
 

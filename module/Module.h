@@ -1,7 +1,7 @@
 // The module's one static descriptor.
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -3,7 +3,7 @@
 
 #include <array>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -8,7 +8,7 @@
 
 #include "imageutility/kernels/ToARGB.h"
 #include "imageutility/kernels/ToAYUV.h"
-#include "module/FrameGeometry.h"
+#include "interface/FrameGeometry.h"
 
 namespace kyv {
 

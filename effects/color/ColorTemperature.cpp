@@ -6,7 +6,7 @@
 #include <limits>
 
 #include "effects/color/ColorFrame.h"
-#include "module/ParamReader.h"
+#include "interface/ParamReader.h"
 
 namespace kyv {
 namespace {

@@ -8,7 +8,7 @@
 #pragma once
 
 #include "effects/color/ColorTemperatureRow.h"
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -6,7 +6,7 @@
 
 #include "effects/color/ColorFrame.h"
 #include "effects/color/WhiteBalanceRow.h"
-#include "module/ParamReader.h"
+#include "interface/ParamReader.h"
 
 namespace kyv {
 namespace {

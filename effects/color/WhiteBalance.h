@@ -6,7 +6,7 @@
 
 #include <cstdint>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -6,7 +6,7 @@
 //   "P4"  float  depth of all bubbles in stereo frames, -1..1
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace KYVImageUtility {
 class CImageARGB;

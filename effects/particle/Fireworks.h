@@ -5,7 +5,7 @@
 //   "P3"  float  depth in stereo frames, -1..1
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

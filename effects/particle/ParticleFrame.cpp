@@ -5,7 +5,7 @@
 #include <new>
 
 #include "effects/particle/ParticleMath.h"
-#include "module/ParamReader.h"
+#include "interface/ParamReader.h"
 
 namespace kyv {
 namespace {

@@ -9,8 +9,8 @@
 #include "effects/particle/ParticleRecord.h"
 #include "effects/particle/StereoLibrary.h"
 #include "imageutility/ImageUtility.h"
-#include "module/FrameGeometry.h"
-#include "module/HostInterface.h"
+#include "interface/FrameGeometry.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

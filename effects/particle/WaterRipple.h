@@ -3,7 +3,7 @@
 //   "P1"  float  how often a ripple is born, 0..1: every 1500 ms to every 500 ms
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace KYVImageUtility {
 class CImageARGB;

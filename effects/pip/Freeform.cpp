@@ -9,8 +9,8 @@
 #include "effects/pip/PipLayers.h"
 #include "imageutility/Conversion.h"
 #include "imageutility/kernels/AlphaBlend.h"
-#include "module/FrameGeometry.h"
-#include "module/ParamReader.h"
+#include "interface/FrameGeometry.h"
+#include "interface/ParamReader.h"
 
 namespace kyv {
 

@@ -10,7 +10,7 @@
 #include <cstdint>
 
 #include "effects/style/GpuPath.h"
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -4,9 +4,9 @@
 
 #include <cstdint>
 
-#include "module/FrameGeometry.h"
-#include "module/GpuHelper.h"
-#include "module/HostInterface.h"
+#include "interface/FrameGeometry.h"
+#include "interface/GpuHelper.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -6,10 +6,10 @@
 
 #include "effects/style/StyleFrame.h"
 #include "effects/style/StyleMask.h"
-#include "module/FrameGeometry.h"
-#include "module/GpuHelper.h"
-#include "module/HostInterface.h"
-#include "module/ParamReader.h"
+#include "interface/FrameGeometry.h"
+#include "interface/GpuHelper.h"
+#include "interface/HostInterface.h"
+#include "interface/ParamReader.h"
 
 namespace kyv {
 

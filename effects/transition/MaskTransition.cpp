@@ -8,8 +8,8 @@
 #include "effects/transition/MaskBlend.h"
 #include "imageutility/Bitmap.h"
 #include "imageutility/Conversion.h"
-#include "module/FrameGeometry.h"
-#include "module/ParamReader.h"
+#include "interface/FrameGeometry.h"
+#include "interface/ParamReader.h"
 #include "threading/RowBand.h"
 
 namespace kyv {

@@ -4,7 +4,7 @@
 #include <cstdint>
 
 #include "imageutility/ImageUtility.h"
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

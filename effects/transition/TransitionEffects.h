@@ -10,7 +10,7 @@
 // that shape, blended there and resized back.
 #pragma once
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -1,6 +1,6 @@
 // A language library: one table of texts, searched by key. KYV_TEXT_ROWS is the file made of the
 // table.
-#include "module/LanguageLibrary.h"
+#include "interface/LanguageLibrary.h"
 
 #include <string.h>
 

@@ -1,7 +1,7 @@
 /* What the tests' GPU helper library was asked for, and how it is to answer. */
 #pragma once
 
-#include "module/GpuHelper.h"
+#include "interface/GpuHelper.h"
 
 #ifdef __cplusplus
 extern "C" {

@@ -4,7 +4,7 @@
 // "probe" has one input; "probe_pair" has two and shows the second one in its last row.
 #include <string.h>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 enum { kModeFine, kModeFailsToBegin, kModeFailsToProcess, kModeCount };
 

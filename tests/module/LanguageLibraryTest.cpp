@@ -7,7 +7,7 @@
 
 #include <gtest/gtest.h>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 #include "module/ResourceLibrary.h"
 #include "platform/Library.h"
 #include "tests/support/TestHost.h"

@@ -1,6 +1,6 @@
 /* The public headers serve C, alone and together. */
-#include "module/HostInterface.h"
-#include "module/LanguageLibrary.h"
+#include "interface/HostInterface.h"
+#include "interface/LanguageLibrary.h"
 
 KyvStatus UseHeader(EffectContext* context);
 

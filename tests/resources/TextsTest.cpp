@@ -10,7 +10,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "module/LanguageLibrary.h"
+#include "interface/LanguageLibrary.h"
 #include "platform/Library.h"
 #include "tests/support/TestHost.h"
 

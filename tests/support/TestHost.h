@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyvtest {
 

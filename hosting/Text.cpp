@@ -1,5 +1,5 @@
 // Small helpers for text.
-#include "host/Text.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 

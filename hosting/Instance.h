@@ -8,8 +8,8 @@
 #include <string_view>
 #include <vector>
 
-#include "host/Easing.h"
-#include "module/HostInterface.h"
+#include "hosting/Easing.h"
+#include "interface/HostInterface.h"
 
 namespace kyvhost {
 

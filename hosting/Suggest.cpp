@@ -1,9 +1,9 @@
 // The nearest name.
-#include "host/Suggest.h"
+#include "hosting/Suggest.h"
 
 #include <algorithm>
 
-#include "host/Names.h"
+#include "hosting/Names.h"
 
 namespace kyvhost {
 

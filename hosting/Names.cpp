@@ -1,13 +1,13 @@
 // Effects and parameters by name.
-#include "host/Names.h"
+#include "hosting/Names.h"
 
 #include <algorithm>
 #include <charconv>
 
-#include "host/ExitStatus.h"
-#include "host/Suggest.h"
-#include "host/Text.h"
-#include "module/LanguageLibrary.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Suggest.h"
+#include "hosting/Text.h"
+#include "interface/LanguageLibrary.h"
 #include "platform/Library.h"
 
 namespace kyvhost {

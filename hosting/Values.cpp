@@ -1,5 +1,5 @@
 // Parameter values as text.
-#include "host/Values.h"
+#include "hosting/Values.h"
 
 #include <cfloat>
 #include <charconv>
@@ -7,9 +7,9 @@
 #include <cstring>
 #include <optional>
 
-#include "host/ExitStatus.h"
-#include "host/Names.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Names.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 namespace {

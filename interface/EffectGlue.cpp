@@ -1,5 +1,5 @@
 // The callback that is the same for every effect.
-#include "module/EffectGlue.h"
+#include "interface/EffectGlue.h"
 
 namespace kyv::glue {
 

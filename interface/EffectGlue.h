@@ -15,7 +15,7 @@
 #include <cstring>
 #include <type_traits>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

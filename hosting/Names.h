@@ -11,7 +11,7 @@
 #include <string_view>
 #include <vector>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyvhost {
 

@@ -1,11 +1,11 @@
 // Loading the module.
-#include "host/Module.h"
+#include "hosting/Module.h"
 
 #include <memory>
 
-#include "host/ExitStatus.h"
-#include "host/Hex.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Hex.h"
+#include "hosting/Text.h"
 #include "platform/Library.h"
 #include "platform/Process.h"
 

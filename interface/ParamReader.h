@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

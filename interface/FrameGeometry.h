@@ -5,7 +5,7 @@
 #include <cstdint>
 
 #include "imageutility/ImageUtility.h"
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyv {
 

@@ -1,13 +1,13 @@
 // The calling order of an effect instance.
-#include "host/Instance.h"
+#include "hosting/Instance.h"
 
 #include <cstring>
 
-#include "host/ExitStatus.h"
-#include "host/Hex.h"
-#include "host/Names.h"
-#include "host/Text.h"
-#include "host/Values.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Hex.h"
+#include "hosting/Names.h"
+#include "hosting/Text.h"
+#include "hosting/Values.h"
 
 namespace kyvhost {
 namespace {

@@ -1,5 +1,5 @@
 // Frame geometry from the context.
-#include "module/FrameGeometry.h"
+#include "interface/FrameGeometry.h"
 
 #include <cstring>
 

@@ -1,5 +1,5 @@
 // Walks the declared sizes to a parameter's place in the buffer.
-#include "module/ParamReader.h"
+#include "interface/ParamReader.h"
 
 #include <cstring>
 

@@ -1,12 +1,12 @@
 // Easing curves.
-#include "host/Easing.h"
+#include "hosting/Easing.h"
 
 #include <algorithm>
 #include <array>
 #include <string>
 
-#include "host/ExitStatus.h"
-#include "host/Text.h"
+#include "hosting/ExitStatus.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 

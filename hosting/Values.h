@@ -13,7 +13,7 @@
 #include <string>
 #include <string_view>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyvhost {
 

@@ -3,7 +3,7 @@
 
 #include <filesystem>
 
-#include "module/HostInterface.h"
+#include "interface/HostInterface.h"
 
 namespace kyvhost {
 
