@@ -3,6 +3,7 @@
 // An effect is a struct with
 //
 //     struct Instance { void* inputs[kInputCount]; ... };   // plain, zero-filled by the host
+//     enum Param : uint32_t { ..., ParamCount };             // the parameters, in table order
 //     static constexpr uint32_t kInputCount = 1;             // or 2
 //     static void Begin(EffectContext&, Instance&);
 //     static KyvStatus Process(EffectContext&, Instance&);

@@ -1,29 +1,44 @@
 // Reads an instance's parameter values, which lie packed in table order without padding.
 #pragma once
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
 
 #include "interface/HostInterface.h"
 
 namespace kyv {
 
-// A view on the context's parameter buffer. A value is read only when its declared size is the one
-// asked for; otherwise, beyond the last parameter or without a buffer it reads as zero.
+// Copies the value at a place of the table. It is read only when its declared size is the one asked
+// for; otherwise, beyond the last parameter or without a buffer, it reads as zero.
+void ReadParam(const EffectContext& context, uint32_t index, void* value, size_t size);
+
+// The values of one effect, by the names that its Param enumeration gives them.
+template <class Param>
 class CParamReader {
 public:
-    explicit CParamReader(const EffectContext& context);
+    explicit CParamReader(const EffectContext& context) : m_context(context) {}
 
-    float Float(uint32_t index) const;
-    int32_t Int(uint32_t index) const;
-    uint32_t Color(uint32_t index) const; // red in the lowest byte
-    uint8_t Byte(uint32_t index) const;
+    float Float(Param param) const { return Value<float>(param); }
+    int32_t Int(Param param) const { return Value<int32_t>(param); }
+    uint32_t Color(Param param) const { return Value<uint32_t>(param); } // red in the lowest byte
+    uint8_t Byte(Param param) const { return Value<uint8_t>(param); }
 
-    // Copies a value of any size; false, with the destination zeroed, when it is not there.
-    bool Bytes(uint32_t index, void* value, uint32_t size) const;
+    // A rectangle or a position.
+    template <size_t kCount>
+    std::array<float, kCount> Floats(Param param) const {
+        return Value<std::array<float, kCount>>(param);
+    }
 
 private:
-    const EffectDescriptor* m_pDescriptor;
-    const uint8_t* m_pBuffer;
+    template <class T>
+    T Value(Param param) const {
+        T value;
+        ReadParam(m_context, param, &value, sizeof value);
+        return value;
+    }
+
+    const EffectContext& m_context;
 };
 
 } // namespace kyv

@@ -107,10 +107,10 @@ KyvStatus ColorTemperature::Process(EffectContext& context, Instance& instance) 
     if (!instance.input || !instance.output || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CParamReader params(context);
-    const float temperature = params.Float(0);
-    const int32_t comparison = params.Int(1);
-    const float tint = params.Float(2);
+    const CParamReader<Param> params(context);
+    const float temperature = params.Float(Temperature);
+    const int32_t comparison = params.Int(Comparison);
+    const float tint = params.Float(Tint);
 
     if (temperature == 0.0F && comparison == 0 && tint == 0.0F) {
         // The call for the left view copies the right one too.

@@ -1,10 +1,4 @@
 // Colour temperature: shifts the picture between cool and warm and between green and magenta.
-//
-//   "P1"  float   -1 warm .. 1 cool: like a higher colour temperature, a positive degree adds blue
-//   "P2"  int     comparison: 0 off, other values leave the left half unprocessed; 2 shows the
-//                 centre half of the picture twice, before and after (hosts set it although the
-//                 parameter is declared a boolean)
-//   "P3"  float   -1 green .. 1 magenta
 #pragma once
 
 #include "effects/color/ColorTemperatureRow.h"
@@ -13,6 +7,15 @@
 namespace kyv {
 
 struct ColorTemperature {
+    enum Param : uint32_t {
+        Temperature, // float  -1 warm .. 1 cool: as with a higher temperature, 1 adds blue
+        Comparison,  // int    0 off, other values leave the left half unprocessed; 2 shows the
+                     //        centre half of the picture twice, before and after (hosts set it
+                     //        although the parameter is declared a boolean)
+        Tint,        // float  -1 green .. 1 magenta
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         void* output;

@@ -62,9 +62,9 @@ KyvStatus WhiteBalance::Process(EffectContext& context, Instance& instance) {
     if (!instance.input || !instance.output || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CParamReader params(context);
-    const uint32_t reference = params.Color(0);
-    const bool compare = params.Int(1) != 0;
+    const CParamReader<Param> params(context);
+    const uint32_t reference = params.Color(ReferencePoint);
+    const bool compare = params.Int(Comparison) != 0;
 
     // Single fields are left as they are: an ARGB frame is not touched at all, an AYUV frame
     // carries the source after its round trip.

@@ -1,7 +1,4 @@
 // White balance: makes a reference colour neutral grey while black stays black.
-//
-//   "P1"  colour  the reference point; white changes nothing
-//   "P2"  int     non-zero leaves the left half unprocessed for comparison
 #pragma once
 
 #include <cstdint>
@@ -11,6 +8,12 @@
 namespace kyv {
 
 struct WhiteBalance {
+    enum Param : uint32_t {
+        ReferencePoint, // colour  white changes nothing
+        Comparison,     // int     non-zero leaves the left half unprocessed
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         void* output;

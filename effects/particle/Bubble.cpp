@@ -19,7 +19,6 @@ constexpr uint16_t kBodyId = 141;
 constexpr uint16_t kMiniatureMaskId = 142;
 constexpr uint16_t kLensMaskId = 143;
 
-constexpr ParamLimits kLimits[] = {{0.0F, 1.0F}, {0.0F, 1.0F}, {0.0F, 1.0F}, {-1.0F, 1.0F}};
 constexpr PreviewSpan kPreview = {10000, 15000.0F};
 
 void Release(BubbleInstance& instance) {
@@ -66,7 +65,7 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
         return KYV_FAIL;
     }
     CParticleFxBubble& particles = *instance.particles;
-    if (ReadChanged(context, kLimits, instance.params)) {
+    if (ReadChanged(context, BubbleParams::Depth, instance.params)) {
         particles.ClearSnapshots();
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
@@ -75,16 +74,16 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
     const ParticleBounds bounds = canvas.GetBounds();
     particles.SetFrame(
         {
-            .density = instance.params[2],
-            .minSize = instance.params[0],
-            .maxSize = instance.params[1],
+            .density = instance.params[BubbleParams::Density],
+            .minSize = instance.params[BubbleParams::MinSize],
+            .maxSize = instance.params[BubbleParams::MaxSize],
             .isRefractive = isRefractive,
             .displayWidth = static_cast<int32_t>(context.displayAspectX),
             .displayHeight = static_cast<int32_t>(context.displayAspectY),
             .scale = canvas.GetScale(),
             .spawn = {.x = 0.0F,
                       .y = bounds.bottom - 1.0F,
-                      .z = instance.params[3],
+                      .z = instance.params[BubbleParams::Depth],
                       .xRange = bounds.width,
                       .yRange = 0.0F},
             .bounds = bounds,

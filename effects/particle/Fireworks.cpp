@@ -10,7 +10,6 @@
 namespace kyv {
 namespace {
 
-constexpr ParamLimits kLimits[] = {{0.0F, 1.0F}, {0.0F, 1.0F}, {-1.0F, 1.0F}};
 constexpr PreviewSpan kPreview = {2000, 7000.0F};
 constexpr CanvasSize kPreviewCanvas = {320, 240};
 
@@ -33,7 +32,7 @@ KyvStatus Fireworks::Process(EffectContext& context, Instance& instance) {
         return KYV_FAIL;
     }
     CParticleFxFireworks& particles = *instance.particles;
-    if (ReadChanged(context, kLimits, instance.params)) {
+    if (ReadChanged(context, Depth, instance.params)) {
         particles.ClearSnapshots();
     }
     // A preview is drawn small and scaled up.
@@ -44,12 +43,12 @@ KyvStatus Fireworks::Process(EffectContext& context, Instance& instance) {
     const ParticleBounds bounds = canvas.GetBounds();
     particles.SetFrame(
         {
-            .size = instance.params[0],
-            .density = instance.params[1],
+            .size = instance.params[Size],
+            .density = instance.params[Density],
             .scale = canvas.GetScale(),
             .spawn = {.x = 0.0F,
                       .y = 0.0F,
-                      .z = instance.params[2],
+                      .z = instance.params[Depth],
                       .xRange = bounds.width,
                       .yRange = bounds.bottom},
             .bounds = bounds,

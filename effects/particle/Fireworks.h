@@ -1,8 +1,4 @@
 // The fireworks effect.
-//
-//   "P1"  float  how far the sparks of a shell fly, 0..1
-//   "P2"  float  how often a shell bursts, 0..1: every 2300 ms to every 300 ms
-//   "P3"  float  depth in stereo frames, -1..1
 #pragma once
 
 #include "interface/HostInterface.h"
@@ -12,11 +8,18 @@ namespace kyv {
 class CParticleFxFireworks;
 
 struct Fireworks {
+    enum Param : uint32_t {
+        Size,    // float  how far the sparks of a shell fly, 0..1
+        Density, // float  how often a shell bursts, 0..1: every 2300 ms to every 300 ms
+        Depth,   // float  in stereo frames, -1..1
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         void* output;
         CParticleFxFireworks* particles; // owned
-        float params[3];                 // what the animation was last simulated with
+        float params[ParamCount];        // what the animation was last simulated with
     };
     static_assert(sizeof(Instance) == 40);
 

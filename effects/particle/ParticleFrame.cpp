@@ -39,14 +39,12 @@ void Scale(const CImageARGB& from, CImageARGB& to) {
 
 } // namespace
 
-bool ReadChanged(const EffectContext& context, const ParamLimits* limits, float* cached,
-                 size_t count) {
-    const CParamReader reader(context);
+bool ReadChanged(const EffectContext& context, uint32_t depth, std::span<float> cached) {
     bool changed = false;
-    for (size_t i = 0; i < count; ++i) {
-        const float read = reader.Float(static_cast<uint32_t>(i));
-        const float value =
-            read == read ? std::clamp(read, limits[i].minimum, limits[i].maximum) : 0.0F;
+    for (uint32_t i = 0; i < cached.size(); ++i) {
+        float read;
+        ReadParam(context, i, &read, sizeof read);
+        const float value = read == read ? std::clamp(read, i == depth ? -1.0F : 0.0F, 1.0F) : 0.0F;
         changed = changed || value != cached[i];
         cached[i] = value;
     }

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <span>
 
 #include "effects/particle/ParticleFxBase.h"
 #include "effects/particle/ParticleRecord.h"
@@ -14,21 +15,12 @@
 
 namespace kyv {
 
-struct ParamLimits {
-    float minimum;
-    float maximum;
-};
+inline constexpr uint32_t kNoDepth = UINT32_MAX; // of an effect without a depth
 
-// The first parameters as simulations may have them: within the limits, and 0 for what is not a
-// number. True when one differs from its cached value; all are cached then.
-bool ReadChanged(const EffectContext& context, const ParamLimits* limits, float* cached,
-                 size_t count);
-
-template <size_t kCount>
-bool ReadChanged(const EffectContext& context, const ParamLimits (&limits)[kCount],
-                 float (&cached)[kCount]) {
-    return ReadChanged(context, limits, cached, kCount);
-}
+// The parameters as simulations may have them: -1..1 for the depth, 0..1 for the others, which are
+// sizes and densities, and 0 for what is not a number. True when one differs from its cached value;
+// all are cached then.
+bool ReadChanged(const EffectContext& context, uint32_t depth, std::span<float> cached);
 
 StereoMode GetStereoMode(const FrameGeometry& geometry);
 

@@ -14,14 +14,13 @@ using KYVImageUtility::CImageARGB;
 
 constexpr uint16_t kSheenId = 145;
 
-constexpr ParamLimits kLimits[] = {{0.0F, 1.0F}};
 constexpr PreviewSpan kPreview = {12000, 8000.0F};
 
 } // namespace
 
 void WaterRipple::Begin(EffectContext& context, Instance& instance) {
     Release(context, instance); // a host may prepare twice
-    instance.params[0] = 0.0F;
+    instance.params[Density] = 0.0F;
     auto particles = std::make_unique<CParticleFxWaterripple>();
     auto sheen = std::make_unique<CImageARGB>();
     if (context.descriptor && context.descriptor->module) {
@@ -41,7 +40,7 @@ KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
         return KYV_FAIL;
     }
     CParticleFxWaterripple& particles = *instance.particles;
-    if (ReadChanged(context, kLimits, instance.params)) {
+    if (ReadChanged(context, kNoDepth, instance.params)) {
         particles.ClearSnapshots();
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
@@ -51,7 +50,7 @@ KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
         .canvas = &canvas.GetImage(),
         .sheen = instance.sheen,
         .scale = canvas.GetScale(),
-        .density = instance.params[0],
+        .density = instance.params[Density],
         .cpuLevel = context.cpuLevel,
     });
     DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);

@@ -1,6 +1,4 @@
 // The water ripple effect.
-//
-//   "P1"  float  how often a ripple is born, 0..1: every 1500 ms to every 500 ms
 #pragma once
 
 #include "interface/HostInterface.h"
@@ -14,12 +12,17 @@ namespace kyv {
 class CParticleFxWaterripple;
 
 struct WaterRipple {
+    enum Param : uint32_t {
+        Density, // float  how often a ripple is born, 0..1: every 1500 ms to every 500 ms
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         void* output;
         CParticleFxWaterripple* particles;  // owned, as is the image
         KYVImageUtility::CImageARGB* sheen; // B, G, R, A
-        float params[1];                    // what the animation was last simulated with
+        float params[ParamCount];           // what the animation was last simulated with
     };
     static_assert(sizeof(Instance) == 40);
 

@@ -75,36 +75,42 @@ LayerColor ToLayerColor(uint32_t color, bool ayuv) {
 }
 
 Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometry, bool ayuv) {
-    const CParamReader params(context);
+    using Param = Freeform::Param;
+    const CParamReader<Param> params(context);
     const float scaleX = static_cast<float>(geometry.width) / ReferenceWidth;
     const float scaleY = static_cast<float>(geometry.height) / ReferenceHeight;
     const float scaleBlur = (scaleX + scaleY) / 2.0F;
     Settings s = {};
-    for (uint32_t i = 0; i < 4; ++i) {
-        s.corners[i] = {ToPixels(params.Float(2 * i), geometry.width),
-                        ToPixels(params.Float(2 * i + 1), geometry.height)};
-    }
-    const uint32_t key = params.Color(9);
-    s.key = {params.Int(8) != 0, (key & 255) << 16 | (key & 0xFF00) | (key >> 16 & 255),
-             params.Byte(10)};
-    s.picture.enabled = params.Int(12) != 0;
-    s.picture.alpha = params.Byte(13);
-    s.picture.blur = Scale(params.Int(14), scaleBlur);
-    s.shadow.enabled = params.Int(15) != 0;
-    s.shadow.first = ToLayerColor(params.Color(16), ayuv);
-    s.shadow.second = ToLayerColor(params.Color(17), ayuv);
-    s.shadow.direction = params.Int(18);
-    s.shadow.alpha = params.Byte(19);
-    s.shadow.blur = Scale(params.Int(20), scaleBlur);
-    s.shadowX = ToPixels(params.Float(21), geometry.width);
-    s.shadowY = ToPixels(params.Float(22), geometry.height);
-    s.border.enabled = params.Int(23) != 0;
-    s.borderSize = s.border.enabled ? Scale(params.Int(24), scaleX) : 0;
-    s.border.first = ToLayerColor(params.Color(25), ayuv);
-    s.border.second = ToLayerColor(params.Color(26), ayuv);
-    s.border.direction = params.Int(27);
-    s.border.alpha = params.Byte(28);
-    s.border.blur = Scale(params.Int(29), scaleBlur);
+    const auto corner = [&](Param x, Param y) -> RasterPoint {
+        return {ToPixels(params.Float(x), geometry.width),
+                ToPixels(params.Float(y), geometry.height)};
+    };
+    s.corners[0] = corner(Param::PointAX, Param::PointAY);
+    s.corners[1] = corner(Param::PointBX, Param::PointBY);
+    s.corners[2] = corner(Param::PointCX, Param::PointCY);
+    s.corners[3] = corner(Param::PointDX, Param::PointDY);
+    const uint32_t key = params.Color(Param::KeyColor);
+    s.key = {params.Int(Param::KeyEnable) != 0,
+             (key & 255) << 16 | (key & 0xFF00) | (key >> 16 & 255),
+             params.Byte(Param::KeyTolerance)};
+    s.picture.enabled = params.Int(Param::PictureEnable) != 0;
+    s.picture.alpha = params.Byte(Param::PictureAlpha);
+    s.picture.blur = Scale(params.Int(Param::PictureBlur), scaleBlur);
+    s.shadow.enabled = params.Int(Param::ShadowEnable) != 0;
+    s.shadow.first = ToLayerColor(params.Color(Param::ShadowColor1), ayuv);
+    s.shadow.second = ToLayerColor(params.Color(Param::ShadowColor2), ayuv);
+    s.shadow.direction = params.Int(Param::ShadowType);
+    s.shadow.alpha = params.Byte(Param::ShadowAlpha);
+    s.shadow.blur = Scale(params.Int(Param::ShadowBlur), scaleBlur);
+    s.shadowX = ToPixels(params.Float(Param::ShadowOffsetX), geometry.width);
+    s.shadowY = ToPixels(params.Float(Param::ShadowOffsetY), geometry.height);
+    s.border.enabled = params.Int(Param::BorderEnable) != 0;
+    s.borderSize = s.border.enabled ? Scale(params.Int(Param::BorderSize), scaleX) : 0;
+    s.border.first = ToLayerColor(params.Color(Param::BorderColor1), ayuv);
+    s.border.second = ToLayerColor(params.Color(Param::BorderColor2), ayuv);
+    s.border.direction = params.Int(Param::BorderType);
+    s.border.alpha = params.Byte(Param::BorderAlpha);
+    s.border.blur = Scale(params.Int(Param::BorderBlur), scaleBlur);
     return s;
 }
 

@@ -4,22 +4,6 @@
 // A position is a part of the frame's size. Sizes in pixels are meant for a frame of 320 x 240.
 // Types are Up, Dn, L, R, UL, UR, LL, LR: where the second colour of a gradient lies.
 //
-//   "P0" to "P7"  float  x and y of the corners A, B, C, D, clockwise from the upper left
-//   "P8"          bool   colour key: enable
-//   "P9", "P10"   colour, byte  the key, and the tolerance in each of red, green and blue
-//   "P11"         byte   nothing
-//   "P12", "P13"  bool, byte    picture: enable, alpha
-//   "P14"         int    picture: blur radius, 0 to 10
-//   "P15"         bool   shadow: enable
-//   "P16", "P17"  colour shadow: the two colours
-//   "P18"         choice shadow: type
-//   "P19", "P20"  byte, int     shadow: alpha, and blur radius 0 to 10
-//   "P21", "P22"  float  shadow: offset, in parts of the frame's size
-//   "P23", "P24"  bool, int     border: enable, and size 0 to 10
-//   "P25", "P26"  colour border: the two colours
-//   "P27"         choice border: type
-//   "P28", "P29"  byte, int     border: alpha, and blur radius 0 to 5
-//
 // Values out of range are safe: what is not a number counts as 0, positions are kept within 2^24
 // pixels, and negative sizes and radii count as 0.
 #pragma once
@@ -34,6 +18,40 @@ class CFreeformPiP;
 class CPipWork;
 
 struct Freeform {
+    enum Param : uint32_t {
+        PointAX, // float   the corners, clockwise from the upper left
+        PointAY,
+        PointBX,
+        PointBY,
+        PointCX,
+        PointCY,
+        PointDX,
+        PointDY,
+        KeyEnable,     // bool
+        KeyColor,      // colour
+        KeyTolerance,  // byte    in each of red, green and blue
+        KeyAlpha,      // byte    nothing
+        PictureEnable, // bool
+        PictureAlpha,  // byte
+        PictureBlur,   // int     radius, 0..10
+        ShadowEnable,  // bool
+        ShadowColor1,  // colour
+        ShadowColor2,  // colour
+        ShadowType,    // choice
+        ShadowAlpha,   // byte
+        ShadowBlur,    // int     radius, 0..10
+        ShadowOffsetX, // float
+        ShadowOffsetY, // float
+        BorderEnable,  // bool
+        BorderSize,    // int     0..10
+        BorderColor1,  // colour
+        BorderColor2,  // colour
+        BorderType,    // choice
+        BorderAlpha,   // byte
+        BorderBlur,    // int     radius, 0..5
+        ParamCount,
+    };
+
     struct Instance {
         void* background;
         void* foreground;

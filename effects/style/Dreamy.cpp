@@ -17,9 +17,9 @@ KyvStatus Dreamy::Process(EffectContext& context, Instance& instance) {
     if (!instance.input || !context.frame || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CParamReader params(context);
-    const MaskShape mask = ReadMask(params, 1);
-    const uint32_t degree = std::clamp<uint32_t>(params.Byte(0), 1, 40);
+    const CParamReader<Param> params(context);
+    const MaskShape mask = ReadMask(params);
+    const uint32_t degree = std::clamp<uint32_t>(params.Byte(Degree), 1, 40);
     const GpuDreamySettings settings = {
         .mask = ToGpuMask(mask),
         .degree = degree,

@@ -1,10 +1,4 @@
 // Dreamy: a soft glow over the picture, or a part of it.
-//
-//   "P1"  byte   degree 1..40: strength and radius of the glow
-//   "P2"  mask   left, top, right, bottom in fractions of the frame; all zero is the whole frame
-//   "P3"  int    1 treats the ellipse inside that rectangle, any other value the rectangle
-//   "P4"  float  width of the soft rim, 0..0.4 of the frame's shorter side
-//   "P5"  int    non-zero treats the outside
 #pragma once
 
 #include <cstdint>
@@ -17,6 +11,17 @@ namespace kyv {
 class CDreamyFilter;
 
 struct Dreamy {
+    enum Param : uint32_t {
+        Degree,      // byte   1..40: strength and radius of the glow
+        MaskRect,    // rect   left, top, right, bottom in fractions of the frame; all zero is the
+                     // whole frame
+        MaskType,    // int    1 treats the ellipse inside that rectangle, any other value the
+                     // rectangle
+        MaskDepth,   // float  width of the soft rim, 0..0.4 of the frame's shorter side
+        MaskInverse, // int    non-zero treats the outside
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         GpuBinding gpu;

@@ -27,11 +27,10 @@ KyvStatus LightRay::Process(EffectContext& context, Instance& instance) {
     if (!instance.input || !context.frame || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CParamReader params(context);
-    float position[2];
-    params.Bytes(1, position, sizeof position);
+    const CParamReader<Param> params(context);
+    const auto position = params.Floats<2>(Position);
     const GpuLightRaySettings settings = {
-        .degree = std::min<uint32_t>(params.Byte(0), 30),
+        .degree = std::min<uint32_t>(params.Byte(Degree), 30),
         .x = Coordinate(position[0]),
         .y = Coordinate(position[1]),
     };

@@ -1,7 +1,4 @@
 // Light ray: shafts of light that stream from the bright parts of the picture.
-//
-//   "P1"  byte      degree 0..30: length and strength; 0 leaves the picture as it is
-//   "P2"  position  the light's place in fractions of the frame; it may lie outside
 #pragma once
 
 #include <cstdint>
@@ -14,6 +11,12 @@ namespace kyv {
 class CLightRayFilter;
 
 struct LightRay {
+    enum Param : uint32_t {
+        Degree,   // byte      0..30: length and strength; 0 leaves the picture as it is
+        Position, // position  the light's place in fractions of the frame; it may lie outside
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         GpuBinding gpu;

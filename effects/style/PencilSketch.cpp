@@ -34,14 +34,14 @@ KyvStatus PencilSketch::Process(EffectContext& context, Instance& instance) {
     if (!instance.input || !context.frame || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CParamReader params(context);
-    const MaskShape mask = ReadMask(params, 3);
+    const CParamReader<Param> params(context);
+    const MaskShape mask = ReadMask(params);
     const GpuPencilSketchSettings settings = {
         .mask = ToGpuMask(mask),
-        .strokeSize = static_cast<uint32_t>(std::clamp(params.Int(0), 1, 10)),
-        .edgeThreshold = std::clamp<uint32_t>(params.Byte(1), 1, 230),
-        .edgeIntensity = std::clamp<uint32_t>(params.Byte(2), 20, 100),
-        .texture = params.Int(7) != 0 ? TextureOf(instance.randomSeed, context.position) : 0,
+        .strokeSize = static_cast<uint32_t>(std::clamp(params.Int(StrokeSize), 1, 10)),
+        .edgeThreshold = std::clamp<uint32_t>(params.Byte(EdgeThreshold), 1, 230),
+        .edgeIntensity = std::clamp<uint32_t>(params.Byte(EdgeIntensity), 20, 100),
+        .texture = params.Int(Random) != 0 ? TextureOf(instance.randomSeed, context.position) : 0,
     };
     if (RenderOnGpu(context, instance.gpu, geometry, instance.input, GpuEffect_PencilSketch,
                     settings)) {

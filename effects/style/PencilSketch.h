@@ -1,13 +1,4 @@
 // Pencil sketch: the picture as a drawing in graphite on paper.
-//
-//   "P1"  int    stroke size 1..10
-//   "P2"  byte   edge threshold 1..230: what is fainter gets no contour
-//   "P3"  byte   edge intensity 20..100
-//   "P4"  mask   left, top, right, bottom in fractions of the frame; all zero is the whole frame
-//   "P5"  int    1 treats the ellipse inside that rectangle, any other value the rectangle
-//   "P6"  float  width of the soft rim, 0..0.4 of the frame's shorter side
-//   "P7"  int    non-zero treats the outside
-//   "P8"  int    non-zero: strokes and grain change from frame to frame
 #pragma once
 
 #include <cstdint>
@@ -20,6 +11,20 @@ namespace kyv {
 class CPencilFilter;
 
 struct PencilSketch {
+    enum Param : uint32_t {
+        StrokeSize,    // int    1..10
+        EdgeThreshold, // byte   1..230: what is fainter gets no contour
+        EdgeIntensity, // byte   20..100
+        MaskRect,      // rect   left, top, right, bottom in fractions of the frame; all zero is the
+                       // whole frame
+        MaskType,      // int    1 treats the ellipse inside that rectangle, any other value the
+                       // rectangle
+        MaskDepth,     // float  width of the soft rim, 0..0.4 of the frame's shorter side
+        MaskInverse,   // int    non-zero treats the outside
+        Random,        // int    non-zero: strokes and grain change from frame to frame
+        ParamCount,
+    };
+
     struct Instance {
         void* input;
         GpuBinding gpu;

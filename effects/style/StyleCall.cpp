@@ -20,20 +20,6 @@ StyleFrame MakeStyleFrame(const EffectContext& context, const FrameGeometry& geo
     };
 }
 
-MaskShape ReadMask(const CParamReader& params, uint32_t firstIndex) {
-    float sides[4];
-    params.Bytes(firstIndex, sides, sizeof sides);
-    return Normalize({
-        .left = sides[0],
-        .top = sides[1],
-        .right = sides[2],
-        .bottom = sides[3],
-        .ellipse = params.Int(firstIndex + 1) == 1,
-        .depth = params.Float(firstIndex + 2),
-        .outside = params.Int(firstIndex + 3) != 0,
-    });
-}
-
 GpuMask ToGpuMask(const MaskShape& mask) {
     return {
         .left = mask.left,

@@ -17,9 +17,20 @@ namespace kyv {
 StyleFrame MakeStyleFrame(const EffectContext& context, const FrameGeometry& geometry,
                           const void* input);
 
-// The four mask parameters, which lie one after the other: rectangle, shape, depth, inverse.
-// Normalised.
-MaskShape ReadMask(const CParamReader& params, uint32_t firstIndex);
+// The mask of an effect whose parameters name one. Normalised.
+template <class Param>
+MaskShape ReadMask(const CParamReader<Param>& params) {
+    const auto sides = params.template Floats<4>(Param::MaskRect);
+    return Normalize({
+        .left = sides[0],
+        .top = sides[1],
+        .right = sides[2],
+        .bottom = sides[3],
+        .ellipse = params.Int(Param::MaskType) == 1,
+        .depth = params.Float(Param::MaskDepth),
+        .outside = params.Int(Param::MaskInverse) != 0,
+    });
+}
 
 GpuMask ToGpuMask(const MaskShape& mask);
 

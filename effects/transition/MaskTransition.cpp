@@ -6,6 +6,7 @@
 #include <new>
 
 #include "effects/transition/MaskBlend.h"
+#include "effects/transition/TransitionParams.h"
 #include "imageutility/Bitmap.h"
 #include "imageutility/Conversion.h"
 #include "interface/FrameGeometry.h"
@@ -23,16 +24,16 @@ constexpr int32_t kBilinear = 0;
 constexpr int32_t kLeastScalable = 2; // pixels each way
 
 MaskBlendParams ReadParams(const EffectContext& context) {
-    const CParamReader reader(context);
-    const uint32_t color = reader.Color(2);
+    const CParamReader<TransitionParams::Param> reader(context);
+    const uint32_t color = reader.Color(TransitionParams::BorderColor);
     uint32_t first = color & 0xFF, second = color >> 8 & 0xFF, third = color >> 16 & 0xFF;
     if (context.pixelFormat == PixelFormat_Ayuv) {
         KYVImageUtility::RgbToYuv(first, second, third, &first, &second, &third);
     }
     // Bytes run B, G, R or V, U, Y.
-    return {.percentage = reader.Float(0),
-            .smoothness = reader.Int(1),
-            .hasBorder = reader.Byte(3) != 0,
+    return {.percentage = reader.Float(TransitionParams::Percentage),
+            .smoothness = reader.Int(TransitionParams::Smoothness),
+            .hasBorder = reader.Byte(TransitionParams::Border) != 0,
             .edge = {static_cast<uint8_t>(third), static_cast<uint8_t>(second),
                      static_cast<uint8_t>(first)}};
 }

@@ -1,15 +1,11 @@
 // The mask transitions: a wipe from input 0 to input 1 where a grey-level picture says when.
 //
-//   "P1"  float    percentage, 0 input 0 .. 1 input 1
-//   "P2"  int      smoothness, 0..40: half the width of the soft band, in grey levels
-//   "P3"  colour   of the border
-//   "P4"  boolean  border: tints the soft band
-//
 // Low grey levels change first. The mask is fitted to the frame's display shape in
 // BeginProcessing. On one thread a frame whose display aspect differs from its shape is resized to
 // that shape, blended there and resized back.
 #pragma once
 
+#include "effects/transition/TransitionParams.h"
 #include "interface/HostInterface.h"
 
 namespace kyv {
@@ -18,7 +14,7 @@ class CMaskTransition;
 class CThreadPool;
 
 // Bitmap 113; on the calling thread, whatever the host's thread count.
-struct TestAlpha {
+struct TestAlpha : TransitionParams {
     struct Instance {
         void* inputs[2];
         void* output;
@@ -34,7 +30,7 @@ struct TestAlpha {
 
 // Bitmap 140. With a thread count of 2 or more the frame is blended in bands of rows, and then
 // without any regard to the display aspect.
-struct AlphaTransition {
+struct AlphaTransition : TransitionParams {
     struct Instance {
         void* inputs[2];
         void* output;
