@@ -13,36 +13,39 @@ Vec2 Unit(Vec2 pixel, int size) {
 
 } // namespace
 
-// Stretched over the whole frame with bilinear filtering and added to it, so: soft lines several
-// texels wide, flat ones that look right when stretched sideways, light in the alpha alone under a
-// nearly constant colour, and no more than a third of full light at the brightest. It tiles.
+// Stretched over the whole frame with bilinear filtering and added to it, so: nothing between the
+// lines, which leaves the picture its blacks; lines a few texels wide that look right when
+// stretched sideways; no more than a third of full light at the brightest. It tiles.
+//
+// A net of caustics, as sunlight draws it on the floor of a pool: bright where threads meet,
+// thinning out between, and here and there lost.
 Sprite DrawSheen() {
     constexpr int kSize = 64;
     const auto lightAt = [](Vec2 pixel) {
-        const Vec2 p = pixel * (1.0f / kSize);
-        const auto lines = [p](int32_t cells, uint32_t seed) {
-            const Vec2 place = {p.x * static_cast<float>(cells), p.y * static_cast<float>(cells)};
+        const Vec2 tile = pixel * (1.0f / kSize);
+        const auto net = [tile](int32_t cells, uint32_t seed, float width) {
+            const Vec2 place = tile * static_cast<float>(cells);
             const Vec2 bend = {Fbm(place, 2, seed, cells), Fbm(place, 2, seed + 7, cells)};
-            const CellDistances cell = CellNoise(place + bend * 0.55f, seed + 20, cells);
-            return SmoothStep(0.42f, 0.0f, cell.second - cell.nearest);
+            const CellDistances cell = CellNoise(place + bend * 0.45f, seed + 20, cells);
+            const float gap = cell.second - cell.nearest;
+            // Where three cells meet, all distances are long: there the light gathers.
+            const float gathered = SmoothStep(0.30f, 0.75f, cell.nearest);
+            return Gauss(gap, width) * (0.35f + 0.9f * gathered);
         };
-        const float wide = lines(3, 40), fine = lines(5, 90);
-        return 0.65f * wide * wide + 0.4f * fine * fine * (0.4f + 0.6f * wide);
+        const float wander = 0.5f + 0.5f * GradientNoise(tile * 3.0f, 5, 3);
+        return net(5, 40, 0.055f) * (0.15f + 1.0f * wander) +
+               0.30f * net(9, 90, 0.07f) * (1.0f - wander);
     };
-    const auto shade = [lightAt](Vec2 pixel) -> Paint {
-        const Vec2 p = pixel * (1.0f / kSize);
+    return ShadeSprite(kSize, kSize, [lightAt](Vec2 pixel) -> Paint {
         float light = 0;
-        for (int i = 0; i < 9; ++i) {
-            constexpr float kReach = 1.5f;
-            light += lightAt(pixel + Vec2{static_cast<float>(i % 3 - 1) * kReach,
-                                          static_cast<float>(i / 3 - 1) * kReach}) *
-                     1.25f / 9;
+        for (int i = 0; i < 49; ++i) { // over a little more than a texel on each side
+            const Vec2 shift = {static_cast<float>(i % 7 - 3) * 0.4f,
+                                static_cast<float>(i / 7 - 3) * 0.4f};
+            light += lightAt(pixel + shift) / 49;
         }
-        const float swell = 0.5f + 0.5f * GradientNoise(Vec2{p.x * 2, p.y * 2}, 5, 2);
-        const Colour colour = Mix(Hex(0xB4E2FF), Hex(0xF4FFF6), Clamp01(light * 1.2f));
-        return {colour, 0.035f + 0.07f * swell + 0.26f * Clamp01(light)};
-    };
-    return ShadeSprite(kSize, kSize, shade);
+        const float bright = 1 - std::exp(-2.6f * light * SmoothStep(0.0f, 0.35f, light));
+        return {Mix(Hex(0xA8DCF4), Hex(0xFFFFF0), bright), 0.25f * bright};
+    });
 }
 
 // A spark of a firework: a hot core, a warm halo, four faint rays.

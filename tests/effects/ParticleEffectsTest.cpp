@@ -110,7 +110,7 @@ TEST_P(ParticleEffects, BytesAreTheSameInEveryBuild) {
         {"Kyv_Dsp_Pfx_Bubble", 0x33DAC2C16CFB59D3},
         {"Kyv_Dsp_Pfx_RefractiveBubble", 0x38A5DD64FD8FD483},
         {"Kyv_Dsp_Pfx_Fireworks", 0x98C57476B0349BE6},
-        {"Kyv_Dsp_Pfx_WaterRipple", 0xDA142A571C61D30D},
+        {"Kyv_Dsp_Pfx_WaterRipple", 0x9A3D618D9D27A2A3},
     };
     uint64_t hash = 0xCBF29CE484222325; // FNV-1a
     for (const uint32_t format : {0U, 1U}) {
