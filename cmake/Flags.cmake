@@ -48,10 +48,18 @@ function(kyv_string_options target)
     endif()
 endfunction()
 
-# Adds sources to a target. The suffix of a kernel file alone gives it its instruction set, and
-# files of a form that is switched off are left out.
+# Adds sources to a target. A _vector.cpp is a kernel's loop: it goes into the library of every
+# instruction set instead, and from there into the module.
 function(kyv_sources target)
     foreach(source IN LISTS ARGN)
+        set(path ${CMAKE_CURRENT_SOURCE_DIR}/${source})
+        if(source MATCHES "_vector\\.cpp$")
+            foreach(set IN LISTS KYV_VECTOR_SETS)
+                target_sources(kyv_kernels_${set} PRIVATE ${path})
+            endforeach()
+            continue()
+        endif()
+        # Forms that have a file for each set: the suffix alone gives it its flags.
         if(source MATCHES "_(sse2|ssse3|avx2)\\.cpp$")
             if(NOT KYV_VECTOR_KERNELS)
                 continue()
@@ -61,6 +69,6 @@ function(kyv_sources target)
                                             PROPERTIES COMPILE_OPTIONS -m${CMAKE_MATCH_1})
             endif()
         endif()
-        target_sources(${target} PRIVATE ${CMAKE_CURRENT_SOURCE_DIR}/${source})
+        target_sources(${target} PRIVATE ${path})
     endforeach()
 endfunction()

@@ -5,14 +5,31 @@
 
 namespace kyv {
 
-// In rising order; each includes those before it.
-enum class InstructionSet { Scalar, Sse2, Ssse3, Avx2 };
+// In rising order; each includes those before it. Avx512 means its foundation together with bytes
+// and words, doublewords and quadwords, and vector lengths (f, bw, dq, vl).
+enum class InstructionSet { Scalar, Sse2, Ssse3, Avx2, Avx512 };
 
-// The best set that this processor and operating system run.
+// What a processor has and its operating system keeps across a change of threads. SSE2 is part of
+// x86-64.
+struct ProcessorFeatures {
+    bool ssse3 = false;
+    bool avx2 = false;
+    bool avx512f = false;
+    bool avx512bw = false;
+    bool avx512dq = false;
+    bool avx512vl = false;
+};
+
+// Of this processor, read once.
+const ProcessorFeatures& GetProcessorFeatures();
+
+// The best set that a processor runs; without an argument, this one.
+InstructionSet ProcessorInstructionSet(const ProcessorFeatures& features);
 InstructionSet ProcessorInstructionSet();
 
-// The set for a host level: below 3 scalar, 3 SSE2, from 4 SSSE3, and AVX2 where the processor
-// has it. The level is a ceiling, so one set too high cannot reach a missing instruction.
+// The set for a host level on a processor: below 3 scalar, 3 SSE2, from 4 the best that it has. The
+// level is a ceiling, so one set too high cannot reach a missing instruction.
+InstructionSet Resolve(int32_t cpuLevel, const ProcessorFeatures& features);
 InstructionSet Resolve(int32_t cpuLevel);
 
 } // namespace kyv

@@ -27,11 +27,7 @@ void AddBlendWithAlpha_scalar(uint8_t* dst, const uint8_t* src, size_t count, ui
     AddChannels<4>(dst, src, count, opacity);
 }
 
-constinit const KernelTable<AddBlendRow> kAddBlend = {
-    .scalar = AddBlend_scalar,
-    .sse2 = KYV_VECTOR_FORM(AddBlend_sse2),
-    .avx2 = KYV_VECTOR_FORM(AddBlend_avx2),
-};
+constinit const KernelTable<AddBlendRow> kAddBlend = {KYV_TABLE(AddBlend)};
 
 // Serves levels below the vector forms only.
 constinit const KernelTable<AddBlendRow> kAddBlendWithAlpha = {

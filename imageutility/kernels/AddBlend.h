@@ -13,9 +13,7 @@ namespace kyv {
 using AddBlendRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
 
 // Adds B, G and R; dst keeps its alpha.
-void AddBlend_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
-void AddBlend_sse2(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
-void AddBlend_avx2(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
+KYV_FORMS(AddBlendRow, AddBlend)
 
 // Adds all four bytes alike.
 void AddBlendWithAlpha_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);

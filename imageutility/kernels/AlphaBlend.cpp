@@ -15,10 +15,6 @@ void AlphaBlend_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_t o
     }
 }
 
-constinit const KernelTable<AlphaBlendRow> kAlphaBlend = {
-    .scalar = AlphaBlend_scalar,
-    .sse2 = KYV_VECTOR_FORM(AlphaBlend_sse2),
-    .avx2 = KYV_VECTOR_FORM(AlphaBlend_avx2),
-};
+constinit const KernelTable<AlphaBlendRow> kAlphaBlend = {KYV_TABLE(AlphaBlend)};
 
 } // namespace kyv

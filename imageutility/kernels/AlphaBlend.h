@@ -12,9 +12,7 @@ namespace kyv {
 // may be src itself but must not overlap it otherwise.
 using AlphaBlendRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
 
-void AlphaBlend_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
-void AlphaBlend_sse2(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
-void AlphaBlend_avx2(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
+KYV_FORMS(AlphaBlendRow, AlphaBlend)
 
 extern const KernelTable<AlphaBlendRow> kAlphaBlend;
 

@@ -12,10 +12,6 @@ void ScreenBlend_scalar(uint8_t* dst, const uint8_t* src, size_t count) {
     }
 }
 
-constinit const KernelTable<ScreenBlendRow> kScreenBlend = {
-    .scalar = ScreenBlend_scalar,
-    .sse2 = KYV_VECTOR_FORM(ScreenBlend_sse2),
-    .avx2 = KYV_VECTOR_FORM(ScreenBlend_avx2),
-};
+constinit const KernelTable<ScreenBlendRow> kScreenBlend = {KYV_TABLE(ScreenBlend)};
 
 } // namespace kyv

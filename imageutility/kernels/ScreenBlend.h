@@ -12,9 +12,7 @@ namespace kyv {
 // overlap it otherwise.
 using ScreenBlendRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count);
 
-void ScreenBlend_scalar(uint8_t* dst, const uint8_t* src, size_t count);
-void ScreenBlend_sse2(uint8_t* dst, const uint8_t* src, size_t count);
-void ScreenBlend_avx2(uint8_t* dst, const uint8_t* src, size_t count);
+KYV_FORMS(ScreenBlendRow, ScreenBlend)
 
 extern const KernelTable<ScreenBlendRow> kScreenBlend;
 

@@ -108,6 +108,8 @@ const std::vector<KernelEntry>& KernelCatalog() {
 
 const char* NameOf(InstructionSet set) {
     switch (set) {
+    case InstructionSet::Avx512:
+        return "avx512";
     case InstructionSet::Avx2:
         return "avx2";
     case InstructionSet::Ssse3:

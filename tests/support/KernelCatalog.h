@@ -58,7 +58,7 @@ const std::vector<KernelEntry>& KernelCatalog();
 
 inline constexpr kyv::InstructionSet kInstructionSets[] = {
     kyv::InstructionSet::Scalar, kyv::InstructionSet::Sse2, kyv::InstructionSet::Ssse3,
-    kyv::InstructionSet::Avx2};
+    kyv::InstructionSet::Avx2, kyv::InstructionSet::Avx512};
 
 const char* NameOf(kyv::InstructionSet set);
 

@@ -1,0 +1,435 @@
+// The operations of Vector.h on x86-64: SSE2, SSSE3, AVX2, and AVX-512 with bytes and words. Most
+// of them have the same name at every width but for the prefix; what differs follows below.
+#pragma once
+
+#include <immintrin.h>
+
+#if defined(KYV_VECTOR_SET_AVX512)
+#define KYV_MM(name) _mm512_##name
+#define KYV_MM_SI(name) _mm512_##name##_si512
+#elif defined(KYV_VECTOR_SET_AVX2)
+#define KYV_MM(name) _mm256_##name
+#define KYV_MM_SI(name) _mm256_##name##_si256
+#else
+#define KYV_MM(name) _mm_##name
+#define KYV_MM_SI(name) _mm_##name##_si128
+#endif
+
+namespace kyv::KYV_VECTOR_SET {
+namespace {
+
+using Block = __m128i;
+#if defined(KYV_VECTOR_SET_AVX512)
+using Vec = __m512i;
+using Floats = __m512;
+using Doubles = __m512d;
+#elif defined(KYV_VECTOR_SET_AVX2)
+using Vec = __m256i;
+using Floats = __m256;
+using Doubles = __m256d;
+#else
+using Vec = __m128i;
+using Floats = __m128;
+using Doubles = __m128d;
+#endif
+
+// --- Memory and constants
+
+inline Vec Load(const void* from) {
+    return KYV_MM_SI(loadu)(static_cast<const Vec*>(from));
+}
+inline void Store(void* to, Vec v) {
+    KYV_MM_SI(storeu)(static_cast<Vec*>(to), v);
+}
+inline Floats LoadF32(const float* from) {
+    return KYV_MM(loadu_ps)(from);
+}
+inline void StoreF32(float* to, Floats v) {
+    KYV_MM(storeu_ps)(to, v);
+}
+inline Vec Zero() {
+    return KYV_MM_SI(setzero)();
+}
+inline Vec Splat8(uint32_t byte) {
+    return KYV_MM(set1_epi8)(static_cast<char>(byte));
+}
+inline Vec Splat16(uint32_t word) {
+    return KYV_MM(set1_epi16)(static_cast<short>(word));
+}
+inline Vec Splat32(uint32_t value) {
+    return KYV_MM(set1_epi32)(static_cast<int>(value));
+}
+inline Floats SplatF32(float value) {
+    return KYV_MM(set1_ps)(value);
+}
+inline Doubles SplatF64(double value) {
+    return KYV_MM(set1_pd)(value);
+}
+
+// --- Operations alike at every width
+
+#define KYV_UNARY(Result, name, Argument, instruction)                                             \
+    inline Result name(Argument a) {                                                               \
+        return KYV_MM(instruction)(a);                                                             \
+    }
+#define KYV_BINARY(Type, name, instruction)                                                        \
+    inline Type name(Type a, Type b) {                                                             \
+        return KYV_MM(instruction)(a, b);                                                          \
+    }
+#define KYV_SHIFT(name, instruction)                                                               \
+    template <int kBits>                                                                           \
+    inline Vec name(Vec v) {                                                                       \
+        return KYV_MM(instruction)(v, kBits);                                                      \
+    }
+
+inline Vec And(Vec a, Vec b) {
+    return KYV_MM_SI(and)(a, b);
+}
+inline Vec Or(Vec a, Vec b) {
+    return KYV_MM_SI(or)(a, b);
+}
+inline Vec Xor(Vec a, Vec b) {
+    return KYV_MM_SI(xor)(a, b);
+}
+inline Vec ClearBits(Vec v, Vec bits) {
+    return KYV_MM_SI(andnot)(bits, v);
+}
+
+KYV_BINARY(Vec, Add8, add_epi8)
+KYV_BINARY(Vec, Add16, add_epi16)
+KYV_BINARY(Vec, Add32, add_epi32)
+KYV_BINARY(Vec, AddSatU8, adds_epu8)
+KYV_BINARY(Vec, Sub8, sub_epi8)
+KYV_BINARY(Vec, Sub16, sub_epi16)
+KYV_BINARY(Vec, Sub32, sub_epi32)
+KYV_BINARY(Vec, SubSatU8, subs_epu8)
+KYV_BINARY(Vec, SubSatU16, subs_epu16)
+KYV_BINARY(Vec, AverageU8, avg_epu8)
+KYV_BINARY(Vec, AverageU16, avg_epu16)
+KYV_BINARY(Vec, MinU8, min_epu8)
+KYV_BINARY(Vec, MaxU8, max_epu8)
+KYV_BINARY(Vec, MinS16, min_epi16)
+KYV_BINARY(Vec, MaxS16, max_epi16)
+KYV_BINARY(Vec, MulLow16, mullo_epi16)
+KYV_BINARY(Vec, MulHighU16, mulhi_epu16)
+KYV_BINARY(Vec, MulHighS16, mulhi_epi16)
+KYV_BINARY(Vec, MulAddPairs16, madd_epi16)
+KYV_BINARY(Vec, MulEvenU32, mul_epu32)
+
+KYV_SHIFT(ShiftLeft16, slli_epi16)
+KYV_SHIFT(ShiftLeft32, slli_epi32)
+KYV_SHIFT(ShiftLeft64, slli_epi64)
+KYV_SHIFT(ShiftRight16, srli_epi16)
+KYV_SHIFT(ShiftRight32, srli_epi32)
+KYV_SHIFT(ShiftRight64, srli_epi64)
+KYV_SHIFT(ShiftRightS16, srai_epi16)
+KYV_SHIFT(ShiftRightS32, srai_epi32)
+
+inline Vec ShiftRightBy32(Vec v, int bits) {
+    return KYV_MM(srl_epi32)(v, _mm_cvtsi32_si128(bits));
+}
+
+KYV_BINARY(Vec, InterleaveLow8, unpacklo_epi8)
+KYV_BINARY(Vec, InterleaveHigh8, unpackhi_epi8)
+KYV_BINARY(Vec, InterleaveLow16, unpacklo_epi16)
+KYV_BINARY(Vec, InterleaveHigh16, unpackhi_epi16)
+KYV_BINARY(Vec, InterleaveLow32, unpacklo_epi32)
+KYV_BINARY(Vec, InterleaveHigh32, unpackhi_epi32)
+KYV_BINARY(Vec, InterleaveLow64, unpacklo_epi64)
+KYV_BINARY(Vec, InterleaveHigh64, unpackhi_epi64)
+KYV_BINARY(Vec, PackU16, packus_epi16)
+KYV_BINARY(Vec, PackS16, packs_epi16)
+KYV_BINARY(Vec, PackS32, packs_epi32)
+
+KYV_BINARY(Floats, AddF32, add_ps)
+KYV_BINARY(Floats, SubF32, sub_ps)
+KYV_BINARY(Floats, MulF32, mul_ps)
+KYV_BINARY(Floats, DivF32, div_ps)
+KYV_BINARY(Floats, MinF32, min_ps)
+KYV_BINARY(Floats, MaxF32, max_ps)
+KYV_UNARY(Floats, SqrtF32, Floats, sqrt_ps)
+KYV_UNARY(Floats, F32FromS32, Vec, cvtepi32_ps)
+KYV_UNARY(Vec, TruncateF32, Floats, cvttps_epi32)
+
+KYV_BINARY(Doubles, AddF64, add_pd)
+KYV_BINARY(Doubles, SubF64, sub_pd)
+KYV_BINARY(Doubles, MulF64, mul_pd)
+KYV_BINARY(Doubles, DivF64, div_pd)
+KYV_BINARY(Doubles, MinF64, min_pd)
+KYV_BINARY(Doubles, MaxF64, max_pd)
+KYV_UNARY(Doubles, SqrtF64, Doubles, sqrt_pd)
+
+// --- Byte shuffles and products, from SSSE3 on
+
+#if defined(KYV_VECTOR_SET_SSE2)
+inline constexpr bool kHasByteShuffle = false;
+
+// These two take many instructions here; kernels that have another way ask kHasByteShuffle.
+inline Vec ShuffleBytes(Vec v, Vec indices) {
+    uint8_t from[16], at[16], to[16];
+    Store(from, v);
+    Store(at, indices);
+    for (int i = 0; i < 16; ++i) {
+        to[i] = at[i] & 0x80 ? 0 : from[at[i] & 15];
+    }
+    return Load(to);
+}
+inline Vec MulAddBytes(Vec unsignedBytes, Vec signedBytes) {
+    const Vec even =
+        MulLow16(And(unsignedBytes, Splat16(0xFF)), ShiftRightS16<8>(ShiftLeft16<8>(signedBytes)));
+    const Vec odd = MulLow16(ShiftRight16<8>(unsignedBytes), ShiftRightS16<8>(signedBytes));
+    return _mm_adds_epi16(even, odd);
+}
+
+// (a * b + 2^14) >> 15 for a within -2^14 .. 2^14 - 1: the half is the top bit of what the high
+// half of the product of 2a leaves out.
+inline Vec MulRound15(Vec a, Vec b) {
+    const Vec twice = Add16(a, a);
+    return Add16(MulHighS16(twice, b), ShiftRight16<15>(MulLow16(twice, b)));
+}
+inline Vec AlphaWords(Vec pixels) {
+    const Vec alpha = ShiftRight32<24>(pixels);
+    return Or(alpha, ShiftLeft32<16>(alpha));
+}
+inline Vec InterleaveHalves16(Vec v) {
+    return _mm_unpacklo_epi16(v, _mm_unpackhi_epi64(v, v));
+}
+#else
+inline constexpr bool kHasByteShuffle = true;
+
+// Within each block the byte that the index names, or 0 for an index below 0.
+KYV_BINARY(Vec, ShuffleBytes, shuffle_epi8)
+// Words a0 * b0 + a1 * b1, saturated.
+KYV_BINARY(Vec, MulAddBytes, maddubs_epi16)
+KYV_BINARY(Vec, MulRound15, mulhrs_epi16)
+#endif
+
+// --- AVX-512
+
+#if defined(KYV_VECTOR_SET_AVX512)
+
+inline Vec Splat64(uint64_t value) {
+    return _mm512_set1_epi64(static_cast<long long>(value));
+}
+inline Vec Ascending32() {
+    return _mm512_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
+}
+inline Vec Repeat(Block block) {
+    return _mm512_broadcast_i32x4(block);
+}
+template <class GetBlock>
+inline Vec FromBlocks(GetBlock block) {
+    const __m256i low = _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
+    const __m256i high = _mm256_inserti128_si256(_mm256_castsi128_si256(block(2)), block(3), 1);
+    return _mm512_inserti64x4(_mm512_castsi256_si512(low), high, 1);
+}
+inline Vec LoadHalf(const void* from) {
+    return _mm512_castsi256_si512(_mm256_loadu_si256(static_cast<const __m256i*>(from)));
+}
+inline Vec LoadBytes16(const uint8_t* from) {
+    return _mm512_cvtepu8_epi16(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(from)));
+}
+inline Vec LoadBytes32(const uint8_t* from) {
+    return _mm512_cvtepu8_epi32(_mm_loadu_si128(reinterpret_cast<const __m128i*>(from)));
+}
+inline Vec LoadWords32(const uint16_t* from) {
+    return _mm512_cvtepu16_epi32(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(from)));
+}
+inline void StoreBytes16(uint8_t* to, Vec words) {
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(to), _mm512_cvtepi16_epi8(words));
+}
+inline Vec Select(Vec mask, Vec yes, Vec no) {
+    return _mm512_ternarylogic_epi32(mask, yes, no, 0xCA);
+}
+inline Vec Equal8(Vec a, Vec b) {
+    return _mm512_movm_epi8(_mm512_cmpeq_epi8_mask(a, b));
+}
+inline Vec Equal16(Vec a, Vec b) {
+    return _mm512_movm_epi16(_mm512_cmpeq_epi16_mask(a, b));
+}
+inline Vec Equal32(Vec a, Vec b) {
+    return _mm512_movm_epi32(_mm512_cmpeq_epi32_mask(a, b));
+}
+inline Vec GreaterS16(Vec a, Vec b) {
+    return _mm512_movm_epi16(_mm512_cmpgt_epi16_mask(a, b));
+}
+inline Vec GreaterS32(Vec a, Vec b) {
+    return _mm512_movm_epi32(_mm512_cmpgt_epi32_mask(a, b));
+}
+inline bool AllSet(Vec mask) {
+    return _mm512_movepi8_mask(mask) == ~__mmask64{0};
+}
+inline bool AnySet(Vec mask) {
+    return _mm512_test_epi32_mask(mask, mask) != 0;
+}
+KYV_BINARY(Vec, MulLow32, mullo_epi32)
+inline Vec MixWords(Vec even, Vec odd) {
+    return _mm512_mask_blend_epi16(0xAAAAAAAA, even, odd);
+}
+// The numbers of 32 bits as they were before two packings, or of 64 bits before one.
+inline Vec InOrder32(Vec v) {
+    return _mm512_permutexvar_epi32(
+        _mm512_setr_epi32(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15), v);
+}
+inline Vec InOrder64(Vec v) {
+    return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), v);
+}
+
+// --- AVX2
+
+#elif defined(KYV_VECTOR_SET_AVX2)
+
+inline Vec Splat64(uint64_t value) {
+    return _mm256_set1_epi64x(static_cast<long long>(value));
+}
+inline Vec Ascending32() {
+    return _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7);
+}
+inline Vec Repeat(Block block) {
+    return _mm256_broadcastsi128_si256(block);
+}
+template <class GetBlock>
+inline Vec FromBlocks(GetBlock block) {
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(block(0)), block(1), 1);
+}
+inline Vec LoadHalf(const void* from) {
+    return _mm256_castsi128_si256(_mm_loadu_si128(static_cast<const __m128i*>(from)));
+}
+inline Vec LoadBytes16(const uint8_t* from) {
+    return _mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(from)));
+}
+inline Vec LoadBytes32(const uint8_t* from) {
+    return _mm256_cvtepu8_epi32(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(from)));
+}
+inline Vec LoadWords32(const uint16_t* from) {
+    return _mm256_cvtepu16_epi32(_mm_loadu_si128(reinterpret_cast<const __m128i*>(from)));
+}
+inline void StoreBytes16(uint8_t* to, Vec words) {
+    _mm_storeu_si128(
+        reinterpret_cast<__m128i*>(to),
+        _mm_packus_epi16(_mm256_castsi256_si128(words), _mm256_extracti128_si256(words, 1)));
+}
+inline Vec Select(Vec mask, Vec yes, Vec no) {
+    return _mm256_blendv_epi8(no, yes, mask);
+}
+KYV_BINARY(Vec, Equal8, cmpeq_epi8)
+KYV_BINARY(Vec, Equal16, cmpeq_epi16)
+KYV_BINARY(Vec, Equal32, cmpeq_epi32)
+KYV_BINARY(Vec, GreaterS16, cmpgt_epi16)
+KYV_BINARY(Vec, GreaterS32, cmpgt_epi32)
+inline bool AllSet(Vec mask) {
+    return _mm256_movemask_epi8(mask) == -1;
+}
+inline bool AnySet(Vec mask) {
+    return !_mm256_testz_si256(mask, mask);
+}
+KYV_BINARY(Vec, MulLow32, mullo_epi32)
+inline Vec MixWords(Vec even, Vec odd) {
+    return _mm256_blend_epi16(even, odd, 0xAA);
+}
+inline Vec InOrder32(Vec v) {
+    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+}
+inline Vec InOrder64(Vec v) {
+    return _mm256_permute4x64_epi64(v, _MM_SHUFFLE(3, 1, 2, 0));
+}
+
+// --- SSE2 and SSSE3
+
+#else
+
+inline Vec Splat64(uint64_t value) {
+    return _mm_set1_epi64x(static_cast<long long>(value));
+}
+inline Vec Ascending32() {
+    return _mm_setr_epi32(0, 1, 2, 3);
+}
+inline Vec Repeat(Block block) {
+    return block;
+}
+template <class GetBlock>
+inline Vec FromBlocks(GetBlock block) {
+    return block(0);
+}
+inline Vec LoadHalf(const void* from) {
+    return _mm_loadl_epi64(static_cast<const __m128i*>(from));
+}
+inline Vec LoadBytes16(const uint8_t* from) {
+    return _mm_unpacklo_epi8(LoadHalf(from), Zero());
+}
+inline Vec LoadBytes32(const uint8_t* from) {
+    int32_t bytes;
+    __builtin_memcpy(&bytes, from, sizeof bytes);
+    return _mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(bytes), Zero()), Zero());
+}
+inline Vec LoadWords32(const uint16_t* from) {
+    return _mm_unpacklo_epi16(LoadHalf(from), Zero());
+}
+inline void StoreBytes16(uint8_t* to, Vec words) {
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(to), _mm_packus_epi16(words, words));
+}
+inline Vec Select(Vec mask, Vec yes, Vec no) {
+    return Or(And(mask, yes), ClearBits(no, mask));
+}
+KYV_BINARY(Vec, Equal8, cmpeq_epi8)
+KYV_BINARY(Vec, Equal16, cmpeq_epi16)
+KYV_BINARY(Vec, Equal32, cmpeq_epi32)
+KYV_BINARY(Vec, GreaterS16, cmpgt_epi16)
+KYV_BINARY(Vec, GreaterS32, cmpgt_epi32)
+inline bool AllSet(Vec mask) {
+    return _mm_movemask_epi8(mask) == 0xFFFF;
+}
+inline bool AnySet(Vec mask) {
+    return _mm_movemask_epi8(mask) != 0;
+}
+// The low half of a product is the same signed and unsigned.
+inline Vec MulLow32(Vec a, Vec b) {
+    const Vec even = _mm_shuffle_epi32(_mm_mul_epu32(a, b), _MM_SHUFFLE(3, 1, 2, 0));
+    const Vec odd = _mm_shuffle_epi32(_mm_mul_epu32(_mm_srli_epi64(a, 32), _mm_srli_epi64(b, 32)),
+                                      _MM_SHUFFLE(3, 1, 2, 0));
+    return _mm_unpacklo_epi32(even, odd);
+}
+inline Vec MixWords(Vec even, Vec odd) {
+    const Vec low = Splat32(0xFFFF);
+    return Or(And(even, low), ClearBits(odd, low));
+}
+inline Vec InOrder32(Vec v) {
+    return v;
+}
+inline Vec InOrder64(Vec v) {
+    return v;
+}
+
+#endif
+
+inline Block LoadBlock(const void* from) {
+    return _mm_loadu_si128(static_cast<const __m128i*>(from));
+}
+// Eight bytes from one place, then eight from another.
+inline Block LoadHalves(const void* first, const void* second) {
+    return _mm_unpacklo_epi64(_mm_loadl_epi64(static_cast<const __m128i*>(first)),
+                              _mm_loadl_epi64(static_cast<const __m128i*>(second)));
+}
+// Sixteen bytes, the same in every block.
+inline Vec RepeatBytes(const int8_t (&bytes)[16]) {
+    return Repeat(LoadBlock(bytes));
+}
+
+#if !defined(KYV_VECTOR_SET_SSE2)
+// The alpha of every pixel, in both of its words.
+inline Vec AlphaWords(Vec pixels) {
+    return ShuffleBytes(pixels,
+                        RepeatBytes({3, -1, 3, -1, 7, -1, 7, -1, 11, -1, 11, -1, 15, -1, 15, -1}));
+}
+// The words of each block's first half, each followed by one of the second half.
+inline Vec InterleaveHalves16(Vec v) {
+    return ShuffleBytes(v, RepeatBytes({0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15}));
+}
+#endif
+
+#undef KYV_UNARY
+#undef KYV_BINARY
+#undef KYV_SHIFT
+
+} // namespace
+} // namespace kyv::KYV_VECTOR_SET
