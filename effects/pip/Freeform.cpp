@@ -3,22 +3,27 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 
+#include "effects/pip/BorderShape.h"
+#include "effects/pip/Coverage.h"
 #include "effects/pip/FreeformPiP.h"
 #include "effects/pip/PictureRows.h"
-#include "effects/pip/PipLayers.h"
+#include "effects/pip/PipLayer.h"
 #include "imageutility/Conversion.h"
-#include "imageutility/kernels/AlphaBlend.h"
 #include "interface/FrameGeometry.h"
 #include "interface/ParamReader.h"
 
 namespace kyv {
 
-// The work images, kept from frame to frame; those of a layer that has never been on have no
-// pixels.
+// What is kept from frame to frame. Each stage notes what its result was made from and compares it
+// with what the next frame wants.
 class CPipWork {
 public:
-    CPipLayer picture;
+    CPictureRows picture;
+    CCoverage coverage;
+    CSpanRows borderSpans;
+    std::optional<BorderShape> borderShape; // of the spans
     CPipLayer border;
     CPipLayer shadow;
 };
@@ -50,6 +55,8 @@ struct Settings {
     int32_t shadowX, shadowY;
     LayerSettings border;
     int32_t borderSize;
+
+    bool DrawsAnything() const { return picture.enabled || shadow.enabled || border.enabled; }
 };
 
 int32_t ToPixels(float part, int32_t length) {
@@ -114,231 +121,176 @@ Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometr
     return s;
 }
 
-// The corners' bounding box, both ends inside.
-RasterWindow BoundCorners(const RasterPoint (&corners)[4]) {
-    const auto capped = [](int32_t value) { return std::min(value, kFarthestInBox); };
-    RasterWindow box = {kFarthestInBox, kFarthestInBox, -kFarthestPoint, -kFarthestPoint};
+// The corners' bounding box.
+PixelBox BoundCorners(const RasterPoint (&corners)[4]) {
+    PixelBox box = {kFarthestInBox, kFarthestInBox, -kFarthestPoint, -kFarthestPoint};
     for (const RasterPoint& corner : corners) {
-        box.left = std::min(box.left, capped(corner.x));
-        box.top = std::min(box.top, capped(corner.y));
-        box.right = std::max(box.right, capped(corner.x));
-        box.bottom = std::max(box.bottom, capped(corner.y));
+        const int32_t x = std::min(corner.x, kFarthestInBox);
+        const int32_t y = std::min(corner.y, kFarthestInBox);
+        box = {std::min(box.left, x), std::min(box.top, y), std::max(box.right, x),
+               std::max(box.bottom, y)};
     }
-    return box;
+    return {box.left, box.top, box.right + 1, box.bottom + 1};
 }
 
-// The output's rows. Those of a field that the call does not treat are left as they are.
-class COutput final : public CRowSink {
-public:
-    COutput(const EffectContext& context, const CImageARGB& image, const CImageARGB& background)
-        : m_image(image), m_background(background), m_field(context.fieldSelector),
-          m_blend(kAlphaBlend.For(Resolve(context.cpuLevel))) {}
-
-    // Copies a row of the background. Null for a row that is not treated.
-    uint8_t* BeginRow(int32_t y) const {
-        if (m_field == (y % 2 ? FieldSelector_First : FieldSelector_Second)) {
-            return nullptr;
-        }
-        uint8_t* row = m_image.Row(y);
-        if (row != m_background.Row(y)) {
-            std::memcpy(row, m_background.Row(y), static_cast<size_t>(m_image.GetWidth()) * 4);
-        }
-        return row;
+// Copies a row of the background; null for one of a field that the call does not treat.
+uint8_t* CopyRow(uint32_t field, const CImageARGB& background, const CImageARGB& output,
+                 int32_t y) {
+    if (field == (y % 2 ? FieldSelector_First : FieldSelector_Second)) {
+        return nullptr;
     }
-
-    void CopyRows(int32_t first, int32_t end) const {
-        for (int32_t y = first; y < end; ++y) {
-            BeginRow(y);
-        }
+    uint8_t* row = output.Row(y);
+    if (row != background.Row(y)) {
+        std::memcpy(row, background.Row(y), static_cast<size_t>(output.GetWidth()) * 4);
     }
+    return row;
+}
 
-    // Where and how the rows of a picture alone go.
-    void SetPicture(const PixelBox& box, uint8_t alpha) {
-        m_box = box;
-        m_alpha = alpha;
-    }
-    void Take(int32_t y, const uint8_t* pixels) override {
-        if (uint8_t* row = BeginRow(y)) {
-            m_blend(row + ptrdiff_t{4} * m_box.left, pixels, static_cast<size_t>(m_box.Width()),
-                    m_alpha);
-        }
-    }
-
-private:
-    const CImageARGB& m_image;
-    const CImageARGB& m_background;
-    uint32_t m_field;
-    AlphaBlendRow m_blend;
-    PixelBox m_box = {};
-    uint8_t m_alpha = 0;
-};
-
-// One frame's work. What is drawn is the same as if every pass went over the whole frame, but for a
-// picture whose box lies outside the frame: it is left out, although its quad marks the edge.
+// One frame: a single pass over its rows. Every stage makes the rows of its result in order and
+// asks the stages before it for as many as it looks at:
+//
+//   picture    foreground, through the map and the key; coverage is taken from it
+//   border     the quad's shape less the coverage
+//   shadow     coverage and shape, moved
+//   output     background, and over it shadow, border and picture, each blurred on the way
+//
+// What comes out is the same as if every stage went over the whole frame before the next, but for
+// a picture whose box lies outside the frame: it is left out, although its quad marks the edge.
 class CFrameWork {
 public:
     CFrameWork(const Settings& settings, CFreeformPiP& pip, CPipWork& work, bool ayuv)
-        : m_settings(settings), m_pip(pip), m_work(work), m_ayuv(ayuv) {
-        const RasterWindow box = BoundCorners(settings.corners);
-        m_quadBox = {box.left, box.top, box.right + 1, box.bottom + 1};
-        m_gradientBox =
-            PixelBox{box.left, box.top, box.right, box.bottom}.Grown(settings.borderSize);
+        : m_settings(settings), m_pip(pip), m_work(work), m_ayuv(ayuv),
+          m_quadBox(BoundCorners(settings.corners)) {}
+
+    // The output may be the frame of either input. Rows of a field that the call does not treat
+    // are left as they are.
+    void Render(uint32_t field, const CImageARGB& foreground, const CImageARGB& background,
+                const CImageARGB& output) {
+        Begin(foreground, foreground.GetBuffer() == output.GetBuffer());
+        for (int32_t y = 0; y < output.GetHeight(); ++y) {
+            if (HasLayers() || m_lead > 0) {
+                m_work.picture.MakeTo(y + m_lead);
+            }
+            uint8_t* row = CopyRow(field, background, output, y);
+            if (m_settings.shadow.enabled) {
+                m_work.shadow.Blend(y, row, m_settings.shadow.alpha);
+            }
+            if (m_settings.border.enabled) {
+                m_work.border.Blend(y, row, m_settings.border.alpha);
+            }
+            if (m_settings.picture.enabled) {
+                m_work.picture.Blend(y, row, m_settings.picture.alpha);
+            }
+        }
+        End();
     }
 
-    // The output may be the frame of either input: the layers are made before it is written, and
-    // what is written row by row needs a foreground of its own.
-    void Render(const CImageARGB& foreground, COutput& output, bool sharesForeground) {
+private:
+    bool HasLayers() const { return m_settings.border.enabled || m_settings.shadow.enabled; }
+
+    void Begin(const CImageARGB& foreground, bool isOverwritten) {
         const int32_t width = foreground.GetWidth();
         const int32_t height = foreground.GetHeight();
         const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
         m_pip.SetSize(width, height, width, height);
         m_pip.SetSourcePoints(source, 4);
         m_pip.SetDestPoints(m_settings.corners, 4);
-        const bool alone = m_settings.picture.enabled && m_settings.picture.blur == 0 &&
-                           !m_settings.border.enabled && !m_settings.shadow.enabled;
-        if (alone && !sharesForeground &&
-            Resolve(foreground.GetCpuLevel()) != InstructionSet::Scalar) {
-            RenderPictureAlone(foreground, output);
-            return;
-        }
-        MakeLayers(foreground);
-        for (int32_t y = 0; y < height; ++y) {
-            if (uint8_t* row = output.BeginRow(y)) {
-                BlendRow(row, y);
-            }
-        }
-    }
 
-private:
-    PixelBox Frame() const { return m_work.picture.Frame(); }
-
-    void RenderPictureAlone(const CImageARGB& foreground, COutput& output) {
-        // The layer does not get what the map will have.
-        m_work.picture.Outdate();
-        const PixelBox frame = {0, 0, foreground.GetWidth(), foreground.GetHeight()};
-        const PixelBox box = PictureBox(frame);
-        if (box.IsEmpty()) {
-            output.CopyRows(0, frame.bottom);
-            return;
-        }
-        output.CopyRows(0, box.top);
-        output.SetPicture(box, m_settings.picture.alpha);
-        CPictureRows rows(frame.right, box, m_settings.key, m_ayuv, foreground.GetCpuLevel(),
-                          output);
-        m_pip.RenderRows(foreground, rows);
-        rows.Finish();
-        output.CopyRows(box.bottom, frame.bottom);
-    }
-
-    // Where the picture can be, with the neighbours that the key looks at; empty for a quad outside
-    // the frame.
-    PixelBox PictureBox(const PixelBox& frame) const {
-        const PixelBox inside = m_quadBox.CutTo(frame);
-        return inside.IsEmpty() ? PixelBox{} : inside.Grown(1).CutTo(frame);
-    }
-
-    void MakeLayers(const CImageARGB& foreground) {
-        RenderPicture(foreground);
+        const int32_t longestBlur = (std::min(width, height) - 1) / 2;
+        const auto blur = [&](const LayerSettings& layer) {
+            return layer.enabled ? std::min(layer.blur, longestBlur) : 0;
+        };
+        m_lead = 0;
         if (m_settings.border.enabled) {
-            m_work.border.Reset(foreground, m_ayuv, TransparentBlack(m_ayuv));
-            MakeBorder();
+            m_lead = std::max(m_lead, blur(m_settings.border));
         }
         if (m_settings.shadow.enabled) {
-            m_work.shadow.Reset(foreground, m_ayuv, TransparentBlack(m_ayuv));
-            MakeShadow();
+            m_lead = std::max(m_lead, blur(m_settings.shadow) - m_settings.shadowY);
         }
-        // These are cut from unblurred coverage, so all blurring comes after.
-        if (m_settings.border.enabled) {
-            m_work.border.Blur(m_quadBox.Grown(m_settings.borderSize).CutTo(Frame()),
-                               m_settings.border.blur);
-        }
-        if (m_settings.picture.enabled) {
-            m_work.picture.Blur(m_quadBox.CutTo(Frame()), m_settings.picture.blur);
-        }
-    }
-
-    void BlendRow(uint8_t* row, int32_t y) const {
-        if (m_settings.shadow.enabled) {
-            m_work.shadow.BlendRow(row, y, m_settings.shadow.alpha);
-        }
-        if (m_settings.border.enabled) {
-            m_work.border.BlendRow(row, y, m_settings.border.alpha);
-        }
-        if (m_settings.picture.enabled) {
-            m_work.picture.BlendRow(row, y, m_settings.picture.alpha);
-        }
-    }
-
-    void RenderPicture(const CImageARGB& foreground) {
-        CPipLayer& layer = m_work.picture;
-        // Keying takes a whole AYUV frame through RGB, from where zeros come back as something
-        // else.
-        const bool convertsClear = m_ayuv && m_settings.key.enabled;
-        // Through the same map the same pixels are drawn again, and the others are still clear.
-        if (m_pip.IsDirty() || convertsClear || !layer.Fits(foreground, m_ayuv)) {
-            // Beyond its box a quad is drawn outside the part in use.
-            if (std::max(layer.Frame().right, layer.Frame().bottom) > kFarthestInBox) {
-                layer.Use(layer.Frame());
-            }
-            layer.Reset(foreground, m_ayuv, 0);
-        }
-        const PixelBox box = PictureBox(Frame());
-        if (box.IsEmpty()) {
+        m_lead = isOverwritten ? height : std::min(m_lead, height);
+        m_work.picture.Begin(m_pip, foreground,
+                             {.key = m_settings.key,
+                              .blur = blur(m_settings.picture),
+                              .ayuv = m_ayuv,
+                              .box = m_quadBox,
+                              .lead = std::max(m_lead, blur(m_settings.picture)),
+                              .coverage = HasLayers() ? &m_work.coverage : nullptr});
+        if (!HasLayers()) {
             return;
         }
-        // With all that a blur will look at.
-        const int32_t margin =
-            convertsClear && m_settings.picture.enabled ? 2 * m_settings.picture.blur : 0;
-        layer.Use(box.Grown(margin));
-        m_pip.Render(foreground, layer.Image());
-        if (m_settings.key.enabled) {
-            layer.ColorKey(m_settings.key);
-        }
-        if (convertsClear) {
-            layer.Outdate();
-        }
-    }
-
-    void MakeBorder() {
-        const LayerSettings& settings = m_settings.border;
-        CPipLayer& layer = m_work.border;
-        layer.Use(m_quadBox.Grown(m_settings.borderSize));
-        DrawBorder(layer, m_settings.corners, m_settings.borderSize, settings.first.Opaque());
-        layer.ClearUnder(m_work.picture);
-        Recolor(layer, settings, m_gradientBox);
-    }
-
-    void MakeShadow() {
-        const LayerSettings& settings = m_settings.shadow;
-        CPipLayer& layer = m_work.shadow;
-        const int32_t dx = m_settings.shadowX;
-        const int32_t dy = m_settings.shadowY;
-        // Only what is in the frame casts a shadow.
-        const PixelBox box =
-            m_quadBox.Grown(m_settings.borderSize).CutTo(Frame()).Moved(dx, dy).CutTo(Frame());
-        layer.Use(box);
-        if (m_settings.picture.enabled) {
-            layer.Stamp(m_work.picture, dx, dy, settings.first.Opaque());
-        }
+        m_work.coverage.Begin(width, height, m_work.picture.Box());
+        BorderShape shape = {
+            width, height, {}, m_settings.border.enabled ? m_settings.borderSize : -1};
+        std::copy(m_settings.corners, m_settings.corners + 4, shape.corners);
+        LayerRecipe recipe = {.shape = shape,
+                              .box = DrawShape(shape)
+                                         .About(m_work.picture.Box())
+                                         .CutTo(m_quadBox.Grown(m_settings.borderSize)),
+                              .ayuv = m_ayuv,
+                              .takesBorder = m_settings.border.enabled,
+                              .gradientBox = GradientBox()};
+        const auto begin = [&](CPipLayer& layer, const LayerSettings& settings) {
+            recipe.first = settings.first;
+            recipe.second = settings.second;
+            recipe.direction = settings.direction;
+            recipe.blur = blur(settings);
+            layer.Begin(recipe, m_work.borderSpans, m_work.coverage,
+                        Resolve(foreground.GetCpuLevel()));
+        };
         if (m_settings.border.enabled) {
-            layer.Stamp(m_work.border, dx, dy, settings.first.Opaque());
+            recipe.cutsPicture = true;
+            begin(m_work.border, m_settings.border);
         }
-        Recolor(layer, settings, m_gradientBox.Moved(dx, dy));
-        layer.Blur(box, settings.blur);
+        if (m_settings.shadow.enabled) {
+            recipe.cutsPicture = false;
+            recipe.takesPicture = m_settings.picture.enabled;
+            recipe.dx = m_settings.shadowX;
+            recipe.dy = m_settings.shadowY;
+            recipe.gradientBox = recipe.gradientBox.Moved(recipe.dx, recipe.dy);
+            begin(m_work.shadow, m_settings.shadow);
+        }
     }
 
-    static void Recolor(CPipLayer& layer, const LayerSettings& settings, const PixelBox& box) {
-        if (settings.first != settings.second) {
-            layer.Gradient(box, settings.direction, settings.first, settings.second);
+    void End() {
+        m_work.picture.End();
+        if (m_settings.border.enabled) {
+            m_work.border.End();
         }
+        if (m_settings.shadow.enabled) {
+            m_work.shadow.End();
+        }
+    }
+
+    // Its bounds.
+    PixelBox DrawShape(const BorderShape& shape) {
+        if (m_work.borderShape != shape) {
+            m_work.borderShape.reset();
+            m_work.borderSpans.Begin(shape.height);
+            const PixelBox box =
+                m_quadBox.Grown(shape.size).CutTo({0, 0, shape.width, shape.height});
+            if (shape.size >= 0 && !box.IsEmpty()) {
+                AddBorderShape(m_work.borderSpans,
+                               {box.left, box.top, box.right - 1, box.bottom - 1}, shape.corners,
+                               shape.size);
+            }
+            m_work.borderSpans.Finish();
+            m_work.borderShape = shape;
+        }
+        return m_work.borderSpans.Bounds();
+    }
+
+    // The corners' box widened by the border; its right and bottom are inside.
+    PixelBox GradientBox() const {
+        return PixelBox{m_quadBox.left, m_quadBox.top, m_quadBox.right - 1, m_quadBox.bottom - 1}
+            .Grown(m_settings.borderSize);
     }
 
     const Settings& m_settings;
     CFreeformPiP& m_pip;
     CPipWork& m_work;
     bool m_ayuv;
-    PixelBox m_quadBox;     // of the corners
-    PixelBox m_gradientBox; // widened by the border; its right and bottom are inside
+    PixelBox m_quadBox;
+    int32_t m_lead = 0; // how many rows ahead of the output the picture is made
 };
 
 void Prepare(Freeform::Instance& instance) {
@@ -363,17 +315,18 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     }
     const CImageARGB output = ViewOf(context, geometry, context.frame);
     const CImageARGB background = ViewOf(context, geometry, instance.background);
-    COutput rows(context, output, background);
-    if (!instance.foreground) {
-        rows.CopyRows(0, geometry.height);
-        return KYV_OK;
-    }
     const bool ayuv = context.pixelFormat == PixelFormat_Ayuv;
     const Settings settings = ReadSettings(context, geometry, ayuv);
+    if (!instance.foreground || !settings.DrawsAnything()) {
+        for (int32_t y = 0; y < geometry.height; ++y) {
+            CopyRow(context.fieldSelector, background, output, y);
+        }
+        return KYV_OK;
+    }
     Prepare(instance);
     CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
-    work.Render(ViewOf(context, geometry, instance.foreground), rows,
-                instance.foreground == context.frame);
+    work.Render(context.fieldSelector, ViewOf(context, geometry, instance.foreground), background,
+                output);
     return KYV_OK;
 }
 

@@ -96,99 +96,97 @@ void CFreeformPiP::SetFilterIndex(int32_t index) {
     m_bDirty = true;
 }
 
-bool CFreeformPiP::PictureOf(const CImageARGB& source, SamplePicture& picture) const {
-    picture = {source.GetBuffer(), source.GetPitch(), source.GetWidth(), source.GetHeight()};
-    return m_bSizeSet && source.GetBuffer() && source.GetWidth() == m_nSourceWidth &&
-           source.GetHeight() == m_nSourceHeight;
+// False without a size or when the source, unless it is null for none, has no pixels or another
+// size.
+bool CFreeformPiP::Prepare(const CImageARGB* source, int32_t cpuLevel) {
+    if (!m_bSizeSet || (source && (!source->GetBuffer() || source->GetWidth() != m_nSourceWidth ||
+                                   source->GetHeight() != m_nSourceHeight))) {
+        return false;
+    }
+    m_renderer = source ? Renderer::Picture : Renderer::Checkerboard;
+    m_picture = {};
+    if (source) {
+        m_picture = {source->GetBuffer(), source->GetPitch(), m_nSourceWidth, m_nSourceHeight};
+    }
+    m_pMapRow = kQuadMapRow.For(Resolve(cpuLevel));
+    m_pSampleRow = kQuadSampleRow.For(Resolve(cpuLevel));
+    if (m_bDirty) {
+        Allocate();
+        RasterPointF quad[4], corners[4];
+        ToFloat(m_destPoints, quad);
+        ToFloat(m_sourcePoints, corners);
+        m_model.Set(quad, corners);
+        m_spans.Begin(m_nDestHeight);
+        CWindowWalk({0, 0, m_nDestWidth - 1, m_nDestHeight - 1})
+            .ClampQuad(m_destPoints, [&](int32_t y, int32_t first, int32_t last) {
+                m_spans.Add(y, first, last);
+            });
+        m_spans.Finish();
+    }
+    return true;
+}
+
+bool CFreeformPiP::BeginRows(const CImageARGB& source) {
+    return Prepare(&source, source.GetCpuLevel());
+}
+
+void CFreeformPiP::DrawRow(int32_t y, uint8_t* row) {
+    for (const Run& run : m_spans.Row(y)) {
+        const auto count = static_cast<size_t>(run.end - run.first);
+        if (m_bDirty) {
+            BuildSpan(run.first, y, count);
+        }
+        RenderSpan(row, run.first, y, count);
+    }
 }
 
 int32_t CFreeformPiP::Render(const CImageARGB& source, CImageARGB& destination) {
-    SamplePicture picture;
-    return PictureOf(source, picture) ? DrawOn(destination, picture, Renderer::Picture) : 0;
-}
-
-int32_t CFreeformPiP::RenderRows(const CImageARGB& source, CRowTarget& target) {
-    SamplePicture picture;
-    return PictureOf(source, picture)
-               ? Draw(picture, target, source.GetCpuLevel(), Renderer::Picture)
-               : 0;
+    return Prepare(&source, source.GetCpuLevel()) ? DrawOn(destination) : 0;
 }
 
 int32_t CFreeformPiP::RenderCheckerboard(CImageARGB& destination) {
     if (m_nMapMode != MapMode_Nearest && m_nMapMode != MapMode_Bilinear) {
         return 0;
     }
-    return DrawOn(destination, {}, Renderer::Checkerboard);
+    return Prepare(nullptr, destination.GetCpuLevel()) ? DrawOn(destination) : 0;
 }
 
-int32_t CFreeformPiP::DrawOn(CImageARGB& destination, const SamplePicture& picture,
-                             Renderer renderer) {
-    class CImageRows final : public CRowTarget {
-    public:
-        explicit CImageRows(const CImageARGB& image) : m_image(image) {}
-        uint8_t* Row(int32_t y) override { return m_image.Row(y); }
-
-    private:
-        const CImageARGB& m_image;
-    };
-    if (!m_bSizeSet || !destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
+// The callback stays installed after a drawing, and pixels that somebody else emits then find
+// nothing to draw on.
+int32_t CFreeformPiP::DrawOn(CImageARGB& destination) {
+    if (!destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
         destination.GetHeight() != m_nDestHeight) {
         return 0;
     }
-    CImageRows rows(destination);
-    return Draw(picture, rows, destination.GetCpuLevel(), renderer);
-}
-
-// What is drawn from and on, for the length of a drawing, however it ends.
-class CFreeformPiP::CDrawing {
-public:
-    CDrawing(CFreeformPiP& pip, const SamplePicture& picture, CRowTarget& target) : m_pip(pip) {
-        m_pip.m_picture = picture;
-        m_pip.m_pTarget = &target;
-    }
-    ~CDrawing() {
-        m_pip.m_picture = {};
-        m_pip.m_pTarget = nullptr;
-    }
-    CDrawing(const CDrawing&) = delete;
-    CDrawing& operator=(const CDrawing&) = delete;
-
-private:
-    CFreeformPiP& m_pip;
-};
-
-int32_t CFreeformPiP::Draw(const SamplePicture& picture, CRowTarget& target, int32_t cpuLevel,
-                           Renderer renderer) {
-    if (m_nMapMode < MapMode_Nearest || m_nMapMode > MapMode_Filtered) {
-        return 1;
-    }
-    if (m_bDirty) {
-        Allocate();
-        RasterPointF quad[4], source[4];
-        ToFloat(m_destPoints, quad);
-        ToFloat(m_sourcePoints, source);
-        m_model.Set(quad, source);
-    }
-    const InstructionSet set = Resolve(cpuLevel);
-    const CDrawing drawing(*this, picture, target);
-    m_renderer = renderer;
-    m_pMapRow = kQuadMapRow.For(set);
-    m_pSampleRow = kQuadSampleRow.For(set);
-
+    static const auto withCurrent = [](const RasterPixel& pixel, auto&& draw) {
+        CFreeformPiP* const pip = Current();
+        if (pip && pip->m_pDestination) {
+            draw(*pip, std::clamp(pixel.x, 0, pip->m_nDestWidth - 1),
+                 std::clamp(pixel.y, 0, pip->m_nDestHeight - 1));
+        }
+    };
     const RasterWindow window = {0, 0, m_nDestWidth - 1, m_nDestHeight - 1};
-    if (set == InstructionSet::Scalar) {
-        DrawThroughCallback(m_destPoints, window);
-    } else {
-        // Span by span, so that the entries are read while the cache still has them.
-        CWindowWalk(window).ClampQuad(m_destPoints, [&](int32_t y, int32_t first, int32_t last) {
-            const auto count = static_cast<size_t>(last - first) + 1;
-            if (m_bDirty) {
-                BuildSpan(first, y, count);
-            }
-            RenderSpan(first, y, count);
+    const CRasterLock lock;
+    g_current = this;
+    m_pDestination = &destination;
+    struct Reset {
+        CImageARGB*& pointer;
+        ~Reset() { pointer = nullptr; }
+    } const reset = {m_pDestination};
+    if (m_bDirty) {
+        CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
+            withCurrent(*pixel,
+                        [](CFreeformPiP& pip, int32_t x, int32_t y) { pip.BuildSpan(x, y, 1); });
         });
+        CRasterizer::FillQuadWithin(window, m_destPoints);
+        m_bDirty = false;
     }
-    m_bDirty = false;
+    CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
+        withCurrent(*pixel, [](CFreeformPiP& pip, int32_t x, int32_t y) {
+            pip.RenderSpan(pip.m_pDestination->Row(y), x, y, 1);
+        });
+    });
+    CRasterizer::FillQuadWithin(window, m_destPoints);
     return 1;
 }
 
@@ -216,41 +214,6 @@ void CFreeformPiP::Allocate() {
         // Pages that no quad touches are never touched here either.
         m_pSourceMap.reset(new uint32_t[entries]);
         m_mapEntries = entries;
-    }
-}
-
-void CFreeformPiP::DrawThroughCallback(const RasterPoint (&quad)[4], const RasterWindow& window) {
-    const CRasterLock lock;
-    g_current = this;
-    if (m_bDirty) {
-        CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
-            if (CFreeformPiP* pip = Current()) {
-                pip->BuildPixel(*pixel);
-            }
-        });
-        CRasterizer::FillQuadWithin(window, quad);
-    }
-    CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
-        if (CFreeformPiP* pip = Current()) {
-            pip->RenderPixel(*pixel);
-        }
-    });
-    CRasterizer::FillQuadWithin(window, quad);
-}
-
-void CFreeformPiP::BuildPixel(const RasterPixel& pixel) {
-    if (m_pTarget) {
-        BuildSpan(std::clamp(pixel.x, 0, m_nDestWidth - 1),
-                  std::clamp(pixel.y, 0, m_nDestHeight - 1), 1);
-    }
-}
-
-// The callback stays installed after a drawing, and pixels that somebody else emits then find
-// nothing to draw on.
-void CFreeformPiP::RenderPixel(const RasterPixel& pixel) {
-    if (m_pTarget) {
-        RenderSpan(std::clamp(pixel.x, 0, m_nDestWidth - 1),
-                   std::clamp(pixel.y, 0, m_nDestHeight - 1), 1);
     }
 }
 
@@ -306,8 +269,8 @@ void CFreeformPiP::BuildFiltered(int32_t x, int32_t y, size_t count) {
     }
 }
 
-void CFreeformPiP::RenderSpan(int32_t x, int32_t y, size_t count) {
-    uint8_t* dst = m_pTarget->Row(y) + ptrdiff_t{4} * x;
+void CFreeformPiP::RenderSpan(uint8_t* row, int32_t x, int32_t y, size_t count) {
+    uint8_t* dst = row + ptrdiff_t{4} * x;
     const auto first =
         static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
     if (m_renderer == Renderer::Picture && m_nMapMode == MapMode_Filtered) {
@@ -329,8 +292,10 @@ void CFreeformPiP::RenderSpan(int32_t x, int32_t y, size_t count) {
     case MapMode_GridBilinear:
         RenderGridBilinear(dst, map, count, m_picture);
         break;
-    default:
+    case MapMode_Bilinear:
         m_pSampleRow(dst, map, count, m_picture);
+        break;
+    default:
         break;
     }
 }

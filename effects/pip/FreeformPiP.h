@@ -5,10 +5,11 @@
 // through it. Entries are 10.6 fixed point in 16 bits, so of a larger picture only the first 1024
 // columns and rows are reached, and what lies beyond wraps round to them.
 //
-// Below level 3 both passes go through the rasterizer's pixel callback. That is process-wide and
-// works on the object that is the current one; a drawing object makes itself current and holds the
-// rasterizer's lock until it has drawn, so that instances on different threads take turns. From
-// level 3 on whole spans are drawn, without any shared state, to the same bytes.
+// Render draws a whole image, pixel by pixel through the rasterizer's callback. That is
+// process-wide and works on the object that is the current one; a drawing object makes itself
+// current and holds the rasterizer's lock until it has drawn, so that instances on different
+// threads take turns. DrawRow draws row by row, by whole spans and without any shared state, to the
+// same bytes.
 #pragma once
 
 #include <cstddef>
@@ -21,19 +22,10 @@
 #include "effects/pip/QuadSampleRow.h"
 #include "effects/pip/Rasterizer.h"
 #include "effects/pip/ResampleFilter.h"
+#include "effects/pip/SpanRows.h"
 #include "imageutility/ImageUtility.h"
 
 namespace kyv {
-
-// Where rows of the frame are drawn.
-class CRowTarget {
-public:
-    // The first pixel of a row of the frame.
-    virtual uint8_t* Row(int32_t y) = 0;
-
-protected:
-    ~CRowTarget() = default;
-};
 
 class CFreeformPiP {
 public:
@@ -74,18 +66,22 @@ public:
     void SetOption(int32_t option) { m_nOption = option; }
     int32_t GetOption() const { return m_nOption; }
 
-    // Draws the picture's quad, at the destination's level. The map is that of the position moved
-    // to the nearest one in the frame, and so are the pixels drawn: a quad that lies outside marks
-    // the frame's edge. Whoever wants nothing of such a quad does not call. Returns 0, with nothing
-    // drawn, without a size or when an image has no pixels or another size, else 1. Throws
-    // std::bad_alloc. The images must not overlap.
+    // Draws the picture's quad. The map is that of the position moved to the nearest one in the
+    // frame, and so are the pixels drawn: a quad that lies outside marks the frame's edge. Whoever
+    // wants nothing of such a quad does not call. Returns 0, with nothing drawn, without a size or
+    // when an image has no pixels or another size, else 1. Throws std::bad_alloc. The images must
+    // not overlap.
     int32_t Render(const KYVImageUtility::CImageARGB& source,
                    KYVImageUtility::CImageARGB& destination);
 
-    // Draws into rows that the target gives, without what Render has to say about a destination. At
-    // level 3 or above their turns come from top to bottom, and rows that the quad does not meet
-    // have none.
-    int32_t RenderRows(const KYVImageUtility::CImageARGB& source, CRowTarget& target);
+    // The same row by row at the source's level: BeginRows, false where Render returns 0, then
+    // DrawRow once for every row that has pixels, with the first pixel of the frame's row, then
+    // EndRows. Without EndRows the map counts as not built.
+    bool BeginRows(const KYVImageUtility::CImageARGB& source);
+    void DrawRow(int32_t y, uint8_t* row);
+    void EndRows() { m_bDirty = false; }
+    // The pixels of the quad, after BeginRows.
+    const CSpanRows& Spans() const { return m_spans; }
 
     // The quad as a checkerboard, to show the map. Needs a map of one entry a pixel, so it returns
     // 0 in modes 1, 3 and 4.
@@ -98,26 +94,19 @@ public:
     const uint32_t* SourceMap() const { return m_pSourceMap.get(); }
 
     // The object that the pixel callbacks work on: the last one constructed, or the last to have
-    // drawn below level 3. Null when that is gone.
+    // rendered. Null when that is gone.
     static CFreeformPiP* Current();
 
 private:
     enum class Renderer { Picture, Checkerboard };
-    class CDrawing;
 
-    int32_t DrawOn(KYVImageUtility::CImageARGB& destination, const SamplePicture& picture,
-                   Renderer renderer);
-    int32_t Draw(const SamplePicture& picture, CRowTarget& target, int32_t cpuLevel,
-                 Renderer renderer);
-    bool PictureOf(const KYVImageUtility::CImageARGB& source, SamplePicture& picture) const;
+    int32_t DrawOn(KYVImageUtility::CImageARGB& destination);
+    bool Prepare(const KYVImageUtility::CImageARGB* source, int32_t cpuLevel);
     void Allocate();
-    void DrawThroughCallback(const RasterPoint (&quad)[4], const RasterWindow& window);
     void BuildSpan(int32_t x, int32_t y, size_t count);
     void BuildFiltered(int32_t x, int32_t y, size_t count);
-    void RenderSpan(int32_t x, int32_t y, size_t count);
+    void RenderSpan(uint8_t* row, int32_t x, int32_t y, size_t count);
     size_t EntriesPerPixel() const;
-    void BuildPixel(const RasterPixel& pixel);
-    void RenderPixel(const RasterPixel& pixel);
     static bool StorePoints(const RasterPoint* points, int32_t count, RasterPoint (&stored)[4]);
 
     static constexpr int32_t kPointLimit = 4;
@@ -139,9 +128,11 @@ private:
     size_t m_mapEntries = 0;
     std::vector<ContributionRecord> m_records; // mode 4: horizontal and vertical, by pixel
 
-    // While drawing: what to read, where to write, and with which forms.
+    CSpanRows m_spans;
+
+    // While drawing: what to read, for Render where to write, and with which forms.
     SamplePicture m_picture = {};
-    CRowTarget* m_pTarget = nullptr;
+    KYVImageUtility::CImageARGB* m_pDestination = nullptr;
     Renderer m_renderer = Renderer::Picture;
     QuadMapRow m_pMapRow = nullptr;
     QuadSampleRow m_pSampleRow = nullptr;

@@ -2,7 +2,6 @@
 #include "effects/pip/LayerRows.h"
 
 #include <cstdlib>
-#include <cstring>
 
 namespace kyv {
 namespace {
@@ -34,14 +33,6 @@ void ColorKeyRow_scalar(uint8_t* pixels, const uint8_t* below, size_t count, uin
     }
 }
 
-void StampRow_scalar(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel) {
-    for (size_t i = 0; i < count * 4; i += 4) {
-        if (layer[i + 3] != 0) {
-            std::memcpy(dst + i, &pixel, 4);
-        }
-    }
-}
-
 void GradientRow_scalar(uint8_t* pixels, const float* top, const float* rise, size_t count,
                         float part) {
     for (size_t i = 0; i < count * 4; i += 4) {
@@ -60,12 +51,6 @@ constinit const KernelTable<ColorKeyRow> kColorKeyRow = {
     .scalar = ColorKeyRow_scalar,
     .sse2 = KYV_VECTOR_FORM(ColorKeyRow_sse2),
     .avx2 = KYV_VECTOR_FORM(ColorKeyRow_avx2),
-};
-
-constinit const KernelTable<StampRow> kStampRow = {
-    .scalar = StampRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(StampRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(StampRow_avx2),
 };
 
 constinit const KernelTable<GradientRow> kGradientRow = {

@@ -1,4 +1,4 @@
-// Rows of the passes that make the layers: keying, stamping, two-colour gradients.
+// Rows of the passes that make the layers: keying, two-colour gradients.
 //
 // Pixels are 4 bytes with alpha last; those with alpha other than 0 are covered.
 #pragma once
@@ -25,15 +25,6 @@ void ColorKeyRow_avx2(uint8_t* pixels, const uint8_t* below, size_t count, uint3
                       uint8_t tolerance);
 
 extern const KernelTable<ColorKeyRow> kColorKeyRow;
-
-// Writes a pixel wherever the layer is covered.
-using StampRow = void (*)(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel);
-
-void StampRow_scalar(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel);
-void StampRow_sse2(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel);
-void StampRow_avx2(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel);
-
-extern const KernelTable<StampRow> kStampRow;
 
 // Recolours covered pixels; alpha is kept. top holds four floats a pixel, B, G, R and one that does
 // not count, for the upper side of the gradient's rectangle, and rise what to add on the way to the

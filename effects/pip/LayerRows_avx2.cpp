@@ -56,14 +56,4 @@ void ColorKeyRow_avx2(uint8_t* pixels, const uint8_t* below, size_t count, uint3
     ColorKeyRow_scalar(pixels + i * 4, below + i * 4, count - i, key, tolerance);
 }
 
-void StampRow_avx2(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel) {
-    const __m256i stamp = _mm256_set1_epi32(static_cast<int>(pixel));
-    size_t i = 0;
-    for (; i + 8 <= count; i += 8) {
-        const __m256i keep = Uncovered(Load(layer + i * 4));
-        Store(dst + i * 4, _mm256_blendv_epi8(stamp, Load(dst + i * 4), keep));
-    }
-    StampRow_scalar(dst + i * 4, layer + i * 4, count - i, pixel);
-}
-
 } // namespace kyv

@@ -54,17 +54,6 @@ void ColorKeyRow_sse2(uint8_t* pixels, const uint8_t* below, size_t count, uint3
     ColorKeyRow_scalar(pixels + i * 4, below + i * 4, count - i, key, tolerance);
 }
 
-void StampRow_sse2(uint8_t* dst, const uint8_t* layer, size_t count, uint32_t pixel) {
-    const __m128i stamp = _mm_set1_epi32(static_cast<int>(pixel));
-    size_t i = 0;
-    for (; i + 4 <= count; i += 4) {
-        const __m128i keep = Uncovered(Load(layer + i * 4));
-        const __m128i kept = _mm_and_si128(keep, Load(dst + i * 4));
-        Store(dst + i * 4, _mm_or_si128(kept, _mm_andnot_si128(keep, stamp)));
-    }
-    StampRow_scalar(dst + i * 4, layer + i * 4, count - i, pixel);
-}
-
 void GradientRow_sse2(uint8_t* pixels, const float* top, const float* rise, size_t count,
                       float part) {
     const __m128 parts = _mm_set1_ps(part);

@@ -1,53 +1,82 @@
-// The picture alone, row by row: a row is keyed and handed on as soon as it and the one below are
-// drawn, while the nearest cache has them, and no layer of the frame's size is touched.
+// The picture of one frame, made row by row: drawn through the quad's map, keyed, blurred.
+//
+// Reads the foreground; row y of the result needs no row of it in order. Drawing, keying (which
+// looks at the row below) and blurring (at `blur` rows to either side) follow each other so closely
+// that the nearest caches still have the rows.
 #pragma once
 
 #include <cstdint>
 #include <vector>
 
-#include "effects/pip/ColorKeyPass.h"
+#include "effects/pip/Coverage.h"
 #include "effects/pip/FreeformPiP.h"
-#include "effects/pip/PipLayers.h"
+#include "effects/pip/RowRing.h"
+#include "effects/pip/SpanRows.h"
+#include "imageutility/BoxBlurRows.h"
+#include "imageutility/kernels/AlphaBlend.h"
 
 namespace kyv {
 
-// Receives finished rows of the box, all of them, top to bottom.
-class CRowSink {
-public:
-    // The first pixel of the box in row y.
-    virtual void Take(int32_t y, const uint8_t* pixels) = 0;
-
-protected:
-    ~CRowSink() = default;
+struct PictureKey {
+    bool enabled;
+    uint32_t color; // 0x00RRGGBB
+    uint8_t tolerance;
 };
 
-// A target for CFreeformPiP::RenderRows whose rows come from top to bottom, in a frame of the given
-// width. What is drawn below the box is dropped. The result is the same as that of a layer and its
-// ColorKey.
-class CPictureRows final : public CRowTarget {
+struct PictureSettings {
+    PictureKey key;
+    int32_t blur; // pixels
+    bool ayuv;
+    PixelBox box;        // where pixels may be drawn
+    int32_t lead;        // how far below the row that is blended others may be asked for
+    CCoverage* coverage; // is given the rows as they are, before the blur; may be null
+};
+
+class CPictureRows {
 public:
-    CPictureRows(int32_t width, const PixelBox& box, const PictureKey& key, bool ayuv,
-                 int32_t cpuLevel, CRowSink& sink);
+    // A frame follows. Throws std::bad_alloc, as do the others. False when there is nothing to
+    // draw.
+    void Begin(CFreeformPiP& pip, const KYVImageUtility::CImageARGB& foreground,
+               const PictureSettings& settings);
 
-    uint8_t* Row(int32_t y) override;
+    // Makes all rows down to y, but for the blur; frameward of that nothing is done again.
+    void MakeTo(int32_t y);
 
-    // Hands on what is left.
-    void Finish();
+    // Blends row y, all of which come in order, over the frame's row.
+    void Blend(int32_t y, uint8_t* frameRow, uint8_t opacity);
+
+    // When all rows have been made the map counts as built.
+    void End() {
+        if (m_nDrawn == m_box.bottom) {
+            m_pPip->EndRows();
+        }
+    }
+
+    // Where the picture can be, with the neighbours that the key looks at; empty for a quad outside
+    // the frame.
+    const PixelBox& Box() const { return m_box; }
 
 private:
-    uint32_t* Slot(int32_t y) { return m_rows.data() + (y & 1 ? m_width : 0); }
-    uint8_t* Pixels(int32_t y) { return reinterpret_cast<uint8_t*>(Slot(y) + m_box.left); }
-    void FinishRow();
+    void Draw(int32_t y);
+    void Finish(int32_t y);
+    const uint8_t* BlurSource(int32_t y);
 
-    size_t m_width;
-    PixelBox m_box;
-    bool m_bKeyed;
-    CColorKeyPass m_key;
-    CRowSink& m_sink;
-    // Two rows in turn: the next to be finished and the one below it. Rows that have not been drawn
-    // on are clear.
-    std::vector<uint32_t> m_rows;
-    int32_t m_nNext;
+    CFreeformPiP* m_pPip = nullptr;
+    PictureSettings m_settings = {};
+    int32_t m_nWidth = 0;
+    int32_t m_nHeight = 0;
+    InstructionSet m_set = InstructionSet::Scalar;
+    PixelBox m_box = {};   // with the neighbours that the key looks at
+    PixelBox m_part = {};  // what is made of every row: with what the blur looks at
+    PixelBox m_reach = {}; // of the blur
+    uint32_t m_clear = 0;  // what is not covered
+    int32_t m_nDrawn = 0;  // the next row to draw
+    int32_t m_nMade = 0;   // the next row to finish
+    int32_t m_nBlurred = 0;
+    CRowRing m_rows;
+    CBoxBlurRows m_window;
+    std::vector<uint32_t> m_clearRow;
+    std::vector<uint32_t> m_blurred;
 };
 
 } // namespace kyv

@@ -22,6 +22,8 @@ namespace kyv {
 struct RasterPoint {
     int32_t x;
     int32_t y;
+
+    bool operator==(const RasterPoint&) const = default;
 };
 
 struct RasterPointF {

@@ -8,9 +8,9 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
-#include <vector>
 
 #include "effects/pip/Rasterizer.h"
+#include "effects/pip/SpanCollapse.h"
 #include "platform/WrapMath.h"
 
 namespace kyv {
@@ -97,31 +97,6 @@ void WalkCircle(RasterPoint centre, int32_t radius, Emit&& emit) {
     }
 }
 
-// One side of a triangle: the column in every row, rising or falling all the way down.
-class CTriangleSide {
-public:
-    constexpr CTriangleSide(RasterPoint from, RasterPoint to)
-        : m_fromX(from.x), m_fromY(from.y), m_toX(to.x), m_toY(to.y) {}
-
-    // A side without height is at its second end, where the walk's rules want it.
-    constexpr int64_t At(int64_t y) const {
-        const int64_t height = m_toY - m_fromY;
-        return height == 0 ? m_toX : (m_toX * (y - m_fromY) + m_fromX * (m_toY - y)) / height;
-    }
-
-    // At most one column from row to row.
-    constexpr bool IsSteep() const {
-        const int64_t width = m_toX > m_fromX ? m_toX - m_fromX : m_fromX - m_toX;
-        return width <= m_toY - m_fromY;
-    }
-
-private:
-    int64_t m_fromX;
-    int64_t m_fromY;
-    int64_t m_toX;
-    int64_t m_toY;
-};
-
 class CWindowWalk {
 public:
     explicit CWindowWalk(const RasterWindow& window) : m_window(window) {}
@@ -129,11 +104,12 @@ public:
     // emit(y, first, last) for the part of every span that is inside.
     template <class Emit>
     void ClipTriangle(const RasterPoint (&vertices)[3], Emit&& emit) const {
-        ForHalves(vertices, [&](const CTriangleSide& a, const CTriangleSide& b, int64_t top,
-                                int64_t bottom) {
-            const int64_t end = std::min<int64_t>(bottom, m_window.bottom);
-            for (int64_t y = std::max<int64_t>(top, m_window.top); y <= end; ++y) {
-                EmitInside(y, std::min(a.At(y), b.At(y)), std::max(a.At(y), b.At(y)), emit);
+        ForHalves(vertices, [&](const TriangleHalf& half) {
+            const int64_t end = std::min<int64_t>(half.bottom, m_window.bottom);
+            for (int64_t y = std::max<int64_t>(half.top, m_window.top); y <= end; ++y) {
+                const int64_t a = half.a.At(y);
+                const int64_t b = half.b.At(y);
+                EmitInside(y, std::min(a, b), std::max(a, b), emit);
             }
         });
     }
@@ -149,143 +125,50 @@ public:
         });
     }
 
-    // emit(y, first, last) for spans that together are the shape with every position outside moved
-    // to the nearest one inside. Rows come top to bottom.
-    template <class Emit>
-    void ClampQuad(const RasterPoint (&quad)[4], Emit&& emit) const {
-        ClampTriangles({{quad[0], quad[1], quad[2]}, {quad[0], quad[2], quad[3]}}, emit);
-    }
-
+    // emit(y, first, last) for spans that together are the triangle with every position outside
+    // moved to the nearest one inside.
     template <class Emit>
     void ClampTriangle(const RasterPoint (&vertices)[3], Emit&& emit) const {
-        ClampTriangles({{vertices[0], vertices[1], vertices[2]}}, emit);
+        const Columns window = {m_window.left, m_window.right};
+        ForHalves(vertices, [&](const TriangleHalf& half) {
+            const auto collapse = [&](int64_t top, int64_t bottom, int32_t target) {
+                Collapse(half, top, bottom, window,
+                         [&](Columns c) { emit(target, c.first, c.last); });
+            };
+            collapse(half.top, std::min<int64_t>(half.bottom, int64_t{m_window.top} - 1),
+                     m_window.top);
+            const int64_t end = std::min<int64_t>(half.bottom, m_window.bottom);
+            for (int64_t y = std::max<int64_t>(half.top, m_window.top); y <= end; ++y) {
+                const Columns row = half.Hull(y, y, window);
+                emit(static_cast<int32_t>(y), row.first, row.last);
+            }
+            collapse(std::max<int64_t>(half.top, int64_t{m_window.bottom} + 1), half.bottom,
+                     m_window.bottom);
+        });
+    }
+
+    // The triangles ABC and ACD.
+    template <class Emit>
+    void ClampQuad(const RasterPoint (&quad)[4], Emit&& emit) const {
+        ClampTriangle({quad[0], quad[1], quad[2]}, emit);
+        ClampTriangle({quad[0], quad[2], quad[3]}, emit);
     }
 
 private:
-    // The rows of a triangle above or below its middle vertex.
-    struct Half {
-        CTriangleSide a;
-        CTriangleSide b;
-        int64_t top;
-        int64_t bottom;
-    };
-
-    template <size_t N, class Emit>
-    void ClampTriangles(const RasterPoint (&triangles)[N][3], Emit&& emit) const {
-        std::vector<Half> halves;
-        halves.reserve(2 * N);
-        int64_t first = m_window.bottom;
-        int64_t last = m_window.top;
-        for (const auto& vertices : triangles) {
-            ForHalves(vertices, [&](const CTriangleSide& a, const CTriangleSide& b, int64_t top,
-                                    int64_t bottom) {
-                halves.push_back({a, b, top, bottom});
-                first = std::min(first, top);
-                last = std::max(last, bottom);
-            });
-        }
-        first = std::max<int64_t>(first, m_window.top);
-        last = std::min<int64_t>(last, m_window.bottom);
-        for (int64_t y = first; y <= last; ++y) {
-            for (const Half& half : halves) {
-                ClampRow(half, y, emit);
-            }
-        }
-    }
-
-    template <class Emit>
-    void ClampRow(const Half& half, int64_t y, Emit&& emit) const {
-        const auto target = static_cast<int32_t>(y);
-        if (y == m_window.top) {
-            Collapse(half.a, half.b, half.top, std::min(half.bottom, y - 1), target, emit);
-        }
-        if (y >= half.top && y <= half.bottom) {
-            const Columns row = Hull(half.a, half.b, y, y);
-            emit(target, row.first, row.last);
-        }
-        if (y == m_window.bottom) {
-            Collapse(half.a, half.b, std::max(half.top, y + 1), half.bottom, target, emit);
-        }
-    }
-
-    // half(a, b, top, bottom): the sides and rows above and below the middle vertex.
-    template <class Half>
-    static void ForHalves(const RasterPoint (&vertices)[3], Half&& half) {
+    template <class Take>
+    static void ForHalves(const RasterPoint (&vertices)[3], Take&& take) {
         const TriangleOrder t = OrderByHeight(vertices);
+        const auto side = [](RasterPoint from, RasterPoint to) {
+            return CTriangleSide({from.x, from.y}, {to.x, to.y});
+        };
         if (t.middle.y == t.top.y) {
             // The one row lies between these two, wherever the third vertex is.
-            half(CTriangleSide(t.middle, t.middle), CTriangleSide(t.top, t.top), t.top.y, t.top.y);
+            take({side(t.middle, t.middle), side(t.top, t.top), t.top.y, t.top.y});
         } else {
-            half(CTriangleSide(t.top, t.middle), CTriangleSide(t.top, t.bottom), t.top.y,
-                 t.middle.y);
+            take({side(t.top, t.middle), side(t.top, t.bottom), t.top.y, t.middle.y});
         }
-        half(CTriangleSide(t.middle, t.bottom), CTriangleSide(t.top, t.bottom),
-             int64_t{t.middle.y} + 1, t.bottom.y);
-    }
-
-    int32_t Clamp(int64_t x) const {
-        return static_cast<int32_t>(std::clamp<int64_t>(x, m_window.left, int64_t{m_window.right}));
-    }
-
-    // The last row up to `last` in which a side is still in the clamped column of row y.
-    int64_t LastRowAlike(const CTriangleSide& side, int64_t y, int64_t last) const {
-        const int32_t column = Clamp(side.At(y));
-        int64_t alike = y;
-        while (alike < last) {
-            const int64_t middle = alike + (last - alike + 1) / 2;
-            if (Clamp(side.At(middle)) == column) {
-                alike = middle;
-            } else {
-                last = middle - 1;
-            }
-        }
-        return alike;
-    }
-
-    // Draws the rows top to bottom onto the one row of the window that is nearest to them. Rows in
-    // which no side moves by more than a column a step leave no gap between their spans, so their
-    // union is known from the first and the last; sides that move faster are through the window
-    // within as many rows as it has columns. Hulls that meet are one span: as sides do not turn
-    // round, what comes after a gap never comes back, and no column is in two spans.
-    template <class Emit>
-    void Collapse(const CTriangleSide& a, const CTriangleSide& b, int64_t top, int64_t bottom,
-                  int32_t target, Emit&& emit) const {
-        if (top > bottom) {
-            return;
-        }
-        Columns pending = Hull(a, b, top, top);
-        for (int64_t y = top; y <= bottom;) {
-            int64_t end = bottom;
-            for (const CTriangleSide* side : {&a, &b}) {
-                if (!side->IsSteep()) {
-                    end = LastRowAlike(*side, y, end);
-                }
-            }
-            const Columns hull = Hull(a, b, y, end);
-            if (hull.first > pending.last + 1 || hull.last < pending.first - 1) {
-                emit(target, pending.first, pending.last);
-                pending = hull;
-            } else {
-                pending = {std::min(pending.first, hull.first), std::max(pending.last, hull.last)};
-            }
-            y = end + 1;
-        }
-        emit(target, pending.first, pending.last);
-    }
-
-    // Both ends inside.
-    struct Columns {
-        int32_t first;
-        int32_t last;
-    };
-
-    Columns Hull(const CTriangleSide& a, const CTriangleSide& b, int64_t top,
-                 int64_t bottom) const {
-        const int32_t a0 = Clamp(a.At(top));
-        const int32_t b0 = Clamp(b.At(top));
-        const int32_t a1 = top == bottom ? a0 : Clamp(a.At(bottom));
-        const int32_t b1 = top == bottom ? b0 : Clamp(b.At(bottom));
-        return {std::min({a0, b0, a1, b1}), std::max({a0, b0, a1, b1})};
+        take(
+            {side(t.middle, t.bottom), side(t.top, t.bottom), int64_t{t.middle.y} + 1, t.bottom.y});
     }
 
     template <class Emit>

@@ -10,7 +10,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "effects/pip/PipLayers.h"
+#include "effects/pip/BorderShape.h"
 #include "effects/pip/Rasterizer.h"
 #include "imageutility/Conversion.h"
 #include "imageutility/ImageUtility.h"
@@ -634,31 +634,122 @@ TEST(Freeform, FramesDoNotDependOnThoseBefore) {
     }
 }
 
+// One thing changes from frame to frame, or nothing: a parameter, or a few rows of the keyed
+// picture. A fresh instance tells what each frame must be.
+TEST(Freeform, WhatIsKeptIsOutdatedByEveryChange) {
+    std::mt19937 random(11);
+    constexpr int kWidth = 96, kHeight = 70;
+    const Frame background = RandomFrame(kWidth * kHeight, 1);
+    for (int round = 0; round < 12; ++round) {
+        CTestInstance instance(Pip(), kWidth, kHeight);
+        const uint32_t format = static_cast<uint32_t>(round) % 2;
+        instance.Context().pixelFormat = format;
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        Params params = RandomParams(random, 0.4F);
+        params.picture = params.border = params.shadow = params.key = 1;
+        params.pictureBlur = params.borderBlur = params.shadowBlur = round % 4;
+        Frame foreground = PatchedFrame(kWidth, kHeight, 2, params.keyColor);
+        for (int i = 0; i < 40; ++i) {
+            const Params other = RandomParams(random, 0.4F);
+            switch (random() % 24) {
+            case 0:
+                std::copy(other.corners, other.corners + 8, params.corners);
+                break;
+            case 1:
+                params.keyColor = other.keyColor;
+                break;
+            case 2:
+                params.tolerance = other.tolerance;
+                break;
+            case 3:
+                params.key = other.key;
+                break;
+            case 4:
+                params.picture = other.picture;
+                break;
+            case 5:
+                params.pictureBlur = other.pictureBlur;
+                break;
+            case 6:
+                params.shadow = other.shadow;
+                break;
+            case 7:
+                params.shadowColors[random() % 2] = other.shadowColors[0];
+                break;
+            case 8:
+                params.shadowType = other.shadowType;
+                break;
+            case 9:
+                params.shadowBlur = other.shadowBlur;
+                break;
+            case 10:
+                params.offset[random() % 2] = other.offset[0];
+                break;
+            case 11:
+                params.border = other.border;
+                break;
+            case 12:
+                params.borderSize = other.borderSize;
+                break;
+            case 13:
+                params.borderColors[random() % 2] = other.borderColors[0];
+                break;
+            case 14:
+                params.borderType = other.borderType;
+                break;
+            case 15:
+                params.borderBlur = other.borderBlur;
+                break;
+            case 16:
+                params.shadowAlpha = params.borderAlpha = params.pictureAlpha = other.shadowAlpha;
+                break;
+            case 17:
+            case 18:
+            case 19: { // a few rows: keyed away, or there again
+                const int y = static_cast<int>(random() % kHeight);
+                const uint32_t key = params.keyColor;
+                const uint32_t pixel = (key & 255) << 16 | (key & 0xFF00) | key >> 16;
+                const auto from = foreground.begin() + y * kWidth;
+                const int rows = std::min(1 + static_cast<int>(random() % 4), kHeight - y);
+                std::fill(from, from + rows * kWidth, random() % 2 ? pixel : ~pixel);
+                break;
+            }
+            case 20:
+                foreground = PatchedFrame(kWidth, kHeight, random(), params.keyColor);
+                break;
+            default:
+                break;
+            }
+            Store(params, instance);
+            Frame output(background.size());
+            ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()), KYV_OK);
+            ASSERT_EQ(output, RenderEffect(params, background, foreground, kWidth, kHeight, format,
+                                           instance.Context().cpuLevel))
+                << "round " << round << " frame " << i;
+            instance.Context().cpuLevel = static_cast<int32_t>(random() % 6);
+        }
+    }
+}
+
 // A triangle's border is the same whichever of its corners is the double one.
 TEST(Freeform, BordersJoinAtDoubledCorners) {
     const RasterPoint points[3] = {{30, 30}, {80, 40}, {125, 70}};
-    for (const int32_t level : {0, 3}) {
-        Frame pixels[3]; // a wide border, of which a wide turn leaves some to its wedge alone
-        for (size_t twice = 0; twice < 3; ++twice) {
-            Frame form(160 * 100);
-            CImageARGB image(reinterpret_cast<uint8_t*>(form.data()), 160, 100, 640);
-            image.SetCpuLevel(level);
-            CPipLayer layer;
-            layer.Reset(image, false, 0);
-            layer.Use(layer.Frame());
-            RasterPoint quad[4];
-            for (size_t i = 0; i < 4; ++i) {
-                quad[i] = points[i <= twice ? i : i - 1];
-            }
-            DrawBorder(layer, quad, 40, 0xFFFFFFFF);
-            for (int y = 0; y < 100; ++y) {
-                const auto* row = reinterpret_cast<const uint32_t*>(layer.Image().Row(y));
-                pixels[twice].insert(pixels[twice].end(), row, row + 160);
-            }
+    std::vector<Runs> rows[3]; // a wide border, of which a wide turn leaves some to its wedge alone
+    for (size_t twice = 0; twice < 3; ++twice) {
+        RasterPoint quad[4];
+        for (size_t i = 0; i < 4; ++i) {
+            quad[i] = points[i <= twice ? i : i - 1];
         }
-        EXPECT_EQ(pixels[0], pixels[1]);
-        EXPECT_EQ(pixels[0], pixels[2]);
+        CSpanRows spans;
+        spans.Begin(100);
+        AddBorderShape(spans, {0, 0, 159, 99}, quad, 40);
+        spans.Finish();
+        for (int y = 0; y < 100; ++y) {
+            rows[twice].emplace_back(spans.Row(y).begin(), spans.Row(y).end());
+        }
     }
+    EXPECT_EQ(rows[0], rows[1]);
+    EXPECT_EQ(rows[0], rows[2]);
 }
 
 // An AYUV picture that is keyed is no longer clear where it is not covered, which only a blur of a

@@ -11,7 +11,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include "effects/pip/Coverage.h"
 #include "effects/pip/Rasterizer.h"
+#include "effects/pip/SpanRows.h"
 #include "effects/pip/SpanWalk.h"
 
 namespace {
@@ -365,6 +367,151 @@ TEST(Rasterizer, RowsBeyondTheWindowCostItsWidthTogether) {
             EXPECT_GE(pixels, width);
             EXPECT_LT(pixels, 12 * int64_t{width});
         }
+    }
+}
+
+// Every half between small triangles' vertices, onto windows of every width, against the rows one
+// by one.
+TEST(SpanCollapse, IsTheUnionOfTheRows) {
+    const auto check = [](const TriangleHalf& half, Columns window) {
+        Shape rows, collapsed;
+        for (int64_t y = half.top; y <= half.bottom; ++y) {
+            const Columns row = half.Hull(y, y, window);
+            for (int x = row.first; x <= row.last; ++x) {
+                rows.emplace(x, 0);
+            }
+        }
+        int spans = 0;
+        Collapse(half, half.top, half.bottom, window, [&](Columns columns) {
+            ++spans;
+            for (int x = columns.first; x <= columns.last; ++x) {
+                EXPECT_TRUE(collapsed.emplace(x, 0).second) << "twice";
+            }
+        });
+        ASSERT_EQ(collapsed, rows);
+        EXPECT_LE(spans, window.last - window.first + 1);
+    };
+    for (int height = 1; height <= 5; ++height) {
+        for (int middle = 1; middle <= height; ++middle) {
+            for (int left = -11; left <= 11; ++left) {
+                for (int right = -11; right <= 11; ++right) {
+                    const CTriangleSide side({2, 0}, {left, middle});
+                    const CTriangleSide other({2, 0}, {right, height});
+                    const CTriangleSide lower({left, middle}, {right, height});
+                    for (const int last : {0, 3, 9}) {
+                        check({side, other, 0, middle}, {0, last});
+                        check({lower, other, middle + 1, height}, {0, last});
+                    }
+                }
+            }
+        }
+    }
+}
+
+TEST(SpanRows, MergeAndCombineAsSetsOfColumnsDo) {
+    std::mt19937 random(9);
+    const auto columns = [](std::span<const kyv::Run> runs) {
+        std::set<int> set;
+        int end = -1000;
+        for (const kyv::Run& run : runs) {
+            EXPECT_TRUE(run.first < run.end && run.first > end); // apart and in order
+            end = run.end;
+            for (int x = run.first; x < run.end; ++x) {
+                set.insert(x);
+            }
+        }
+        return set;
+    };
+    CSpanRows spans;
+    for (int round = 0; round < 300; ++round) {
+        constexpr int kRows = 6;
+        std::set<int> expected[kRows];
+        spans.Begin(kRows);
+        for (uint32_t i = random() % 30; i > 0; --i) {
+            const int y = static_cast<int>(random() % kRows),
+                      first = static_cast<int>(random() % 40);
+            const int last = first + static_cast<int>(random() % 8);
+            spans.Add(y, first, last);
+            for (int x = first; x <= last; ++x) {
+                expected[y].insert(x);
+            }
+        }
+        spans.Finish();
+        PixelBox bounds = {};
+        Runs combined;
+        for (int y = 0; y < kRows; ++y) {
+            const std::set<int>& here = expected[y];
+            const std::set<int>& next = expected[(y + 1) % kRows];
+            const auto a = spans.Row(y), b = spans.Row((y + 1) % kRows);
+            ASSERT_EQ(columns(a), here);
+            std::set<int> both = here, rest;
+            both.insert(next.begin(), next.end());
+            std::set_difference(here.begin(), here.end(), next.begin(), next.end(),
+                                std::inserter(rest, rest.end()));
+            Unite(a, b, combined);
+            ASSERT_EQ(columns(combined), both);
+            Subtract(a, b, combined);
+            ASSERT_EQ(columns(combined), rest);
+            if (!here.empty()) {
+                bounds = bounds.About({*here.begin(), y, *here.rbegin() + 1, y + 1});
+            }
+        }
+        EXPECT_EQ(spans.Bounds(), bounds);
+        EXPECT_TRUE(spans.Row(-1).empty() && spans.Row(kRows).empty());
+    }
+}
+
+TEST(Coverage, KeepsBitsAndTellsOfChanges) {
+    std::mt19937 random(10);
+    CCoverage coverage;
+    for (int round = 0; round < 60; ++round) {
+        const int width = 1 + static_cast<int>(random() % 300);
+        const int left = static_cast<int>(random() % static_cast<unsigned>(width));
+        const PixelBox box = {
+            left, 1, left + 1 + static_cast<int>(random() % static_cast<unsigned>(width - left)),
+            3};
+        std::vector<uint32_t> pixels(static_cast<size_t>(width));
+        const auto take = [&](int y) {
+            coverage.Take(y, reinterpret_cast<const uint8_t*>(pixels.data()));
+        };
+        for (uint32_t& pixel : pixels) { // long runs, and lone pixels of any alpha
+            const bool rare = random() % 16 == 0;
+            pixel = (&pixel - pixels.data()) / 37 % 2 ? 0xFF000000 : 0x00FFFFFF;
+            pixel = rare ? static_cast<uint32_t>(random()) & 0x80FFFFFF : pixel;
+        }
+        coverage.Begin(width, 4, box);
+        take(1);
+        take(2);
+        Runs runs, expected;
+        for (int x = box.left; x < box.right; ++x) {
+            if (pixels[static_cast<size_t>(x)] >> 24) {
+                if (expected.empty() || expected.back().end != x) {
+                    expected.push_back({x, x});
+                }
+                expected.back().end = x + 1;
+            }
+        }
+        for (const int y : {1, 2}) {
+            coverage.GetRuns(y, runs);
+            ASSERT_EQ(runs, expected) << width << " wide, from " << box.left << " to " << box.right;
+        }
+        for (const int y : {-1, 0, 3, 4}) {
+            coverage.GetRuns(y, runs);
+            EXPECT_TRUE(runs.empty());
+        }
+        const uint64_t serial = coverage.Serial();
+        coverage.Begin(width, 4, box);
+        take(1);
+        EXPECT_EQ(coverage.LastChanged(), -1);
+        EXPECT_EQ(coverage.Serial(), serial);
+        pixels[static_cast<size_t>(box.right - 1)] ^=
+            0x40000000; // 0 or 128 to 64 or 192, 255 to 191
+        take(2);
+        const bool changed = expected.empty() || expected.back().end != box.right;
+        EXPECT_EQ(coverage.LastChanged(), changed ? 2 : -1);
+        EXPECT_EQ(coverage.Serial() != serial, changed);
+        coverage.Begin(width, 5, box);
+        EXPECT_NE(coverage.Serial(), serial);
     }
 }
 

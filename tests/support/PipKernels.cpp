@@ -113,12 +113,6 @@ void AddLayers(std::vector<KernelEntry>& list) {
                 form(pixels, src[0], count, key, tolerance);
             };
         }));
-    list.push_back(Rows(kyv::kStampRow, {.table = "kStampRow", .readsDst = true, .inPlace = true},
-                        [](uint32_t seed) {
-                            return [pixel = seed % 2 ? seed * 2654435761U : 0](
-                                       auto form, uint8_t* dst, const uint8_t* const* src,
-                                       size_t count) { form(dst, src[0], count, pixel); };
-                        }));
     list.push_back(
         Rows(kyv::kGradientRow, {.table = "kGradientRow", .readsDst = true, .sourceBytes = {}},
              [](uint32_t seed) {
