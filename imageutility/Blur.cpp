@@ -1,5 +1,4 @@
 // The box blur of whole images.
-#include <algorithm>
 #include <cstring>
 
 #include "imageutility/BoxBlurRows.h"
@@ -10,23 +9,11 @@
 namespace KYVImageUtility {
 namespace {
 
-void BlurRows(const CImageBase& source, const CImageBase& destination, int32_t radius) {
-    kyv::CBoxBlurRows window;
-    const int32_t height = source.GetHeight();
-    if (!window.Begin(source.GetWidth(), height, radius, kyv::Resolve(source.GetCpuLevel()))) {
-        return;
-    }
-    for (int32_t y = 0; y < radius; ++y) {
-        window.Slide(source.Row(y), nullptr);
-    }
-    for (int32_t y = 0; y < height; ++y) {
-        window.Blur(destination.Row(y), y, y + radius < height ? source.Row(y + radius) : nullptr,
-                    y > radius ? source.Row(y - radius - 1) : nullptr);
-    }
-}
-
 // Rows are read again after those above them have been written, so a copy is blurred.
 void BlurInPlace(const CImageBase& image, int32_t radius) {
+    if (radius == 0) {
+        return;
+    }
     const size_t rowBytes = static_cast<size_t>(image.GetWidth()) * 4;
     const kyv::CPageBlock block(rowBytes * static_cast<size_t>(image.GetHeight()));
     if (!block.GetData()) {
@@ -38,7 +25,7 @@ void BlurInPlace(const CImageBase& image, int32_t radius) {
     for (int32_t y = 0; y < image.GetHeight(); ++y) {
         std::memcpy(copy.Row(y), image.Row(y), rowBytes);
     }
-    BlurRows(copy, image, radius);
+    kyv::CBoxBlurRows().BlurImage(copy, image, radius);
 }
 
 template <class Image>
@@ -46,16 +33,10 @@ void BlurOrCopy(const Image& image, Image& destination, int32_t radius) {
     if (!CanPair(image, destination) || radius < 0) {
         return;
     }
-    const int32_t shorter = std::min(image.GetWidth(), image.GetHeight());
-    if (shorter <= int64_t{2} * radius) {
-        radius = (shorter - 1) / 2;
-    }
-    if (radius == 0) {
-        destination.CopyFrom(image);
-    } else if (image.GetBuffer() == destination.GetBuffer()) {
+    if (image.GetBuffer() == destination.GetBuffer()) {
         BlurInPlace(image, radius);
     } else {
-        BlurRows(image, destination, radius);
+        kyv::CBoxBlurRows().BlurImage(image, destination, radius);
     }
 }
 

@@ -77,6 +77,33 @@ bool CBoxBlurRows::Begin(int32_t width, int32_t height, int32_t radius, Instruct
     return true;
 }
 
+bool CBoxBlurRows::BlurImage(const KYVImageUtility::CImageBase& source,
+                             const KYVImageUtility::CImageBase& destination, int32_t radius) {
+    const int32_t height = source.GetHeight();
+    const int32_t shorter = std::min(source.GetWidth(), height);
+    if (shorter <= int64_t{2} * radius) {
+        radius = (shorter - 1) / 2;
+    }
+    if (radius == 0) {
+        for (int32_t y = 0; y < height; ++y) {
+            std::memcpy(destination.Row(y), source.Row(y),
+                        static_cast<size_t>(source.GetWidth()) * 4);
+        }
+        return true;
+    }
+    if (!Begin(source.GetWidth(), height, radius, Resolve(source.GetCpuLevel()))) {
+        return false;
+    }
+    for (int32_t y = 0; y < radius; ++y) {
+        Slide(source.Row(y), nullptr);
+    }
+    for (int32_t y = 0; y < height; ++y) {
+        Blur(destination.Row(y), y, y + radius < height ? source.Row(y + radius) : nullptr,
+             y > radius ? source.Row(y - radius - 1) : nullptr);
+    }
+    return true;
+}
+
 void CBoxBlurRows::Slide(const uint8_t* enter, const uint8_t* leave) {
     enter = enter ? enter : m_pNoRow;
     leave = leave ? leave : m_pNoRow;

@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
+#include <new>
 
 #include "effects/style/ShrinkRow.h"
 #include "effects/style/StyleMath.h"
@@ -111,7 +112,9 @@ void CSmallPicture::Blur(float sigma) {
     for (int32_t pass = 0; pass < 3; ++pass) {
         const int32_t r = radius + (pass < wider ? 1 : 0);
         if (r > 0) {
-            m_image.BoxBlur(m_other, r);
+            if (!m_window.BlurImage(m_image, m_other, r)) {
+                throw std::bad_alloc();
+            }
             m_image.Swap(m_other);
         }
     }

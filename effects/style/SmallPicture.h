@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <vector>
 
+#include "imageutility/BoxBlurRows.h"
 #include "imageutility/ImageUtility.h"
 #include "platform/CpuFeatures.h"
 
@@ -47,6 +48,7 @@ public:
 private:
     KYVImageUtility::CImageARGB m_image;
     KYVImageUtility::CImageARGB m_other; // the blur goes back and forth
+    CBoxBlurRows m_window;
     InstructionSet m_set = InstructionSet::Scalar;
     int32_t m_frameWidth = 0;
     int32_t m_frameHeight = 0;

@@ -752,6 +752,48 @@ TEST(Freeform, BordersJoinAtDoubledCorners) {
     EXPECT_EQ(rows[0], rows[2]);
 }
 
+// Bytes of whole sequences, every layout, field, level and output, as they have been since the
+// effect was written.
+TEST(Freeform, SequencesKeepTheirBytes) {
+    constexpr std::pair<int, int> kSizes[] = {{64, 48}, {161, 120}, {33, 90}, {200, 3}, {1100, 20}};
+    std::mt19937 random(12);
+    uint64_t hash = 14695981039346656037U; // FNV-1a over pixels
+    for (const auto& [width, height] : kSizes) {
+        for (int sequence = 0; sequence < 12; ++sequence) {
+            CTestInstance instance(Pip(), static_cast<uint32_t>(width),
+                                   static_cast<uint32_t>(height));
+            EffectContext& context = instance.Context();
+            context.pixelFormat = random() % 2;
+            context.stereoLayout = random() % 3;
+            const int views = context.stereoLayout == StereoLayout_Mono ? 1 : 2;
+            ASSERT_EQ(instance.Begin(), KYV_OK);
+            Params params = RandomParams(random, 0.6F);
+            for (uint32_t i = 0; i < 6; ++i) {
+                if (random() % 2) {
+                    const Params other = RandomParams(random, 0.6F);
+                    std::copy(other.corners, other.corners + 8, params.corners);
+                    params.key = other.key;
+                    params.borderBlur = other.borderBlur;
+                }
+                context.cpuLevel = static_cast<int32_t>(random() % 6);
+                context.fieldSelector = random() % 4 == 0 ? random() % 3 : 0;
+                Store(params, instance);
+                Frame background = RandomFrame(static_cast<size_t>(width * views * height), i);
+                Frame foreground = PatchedFrame(width * views, height, i, params.keyColor);
+                Frame apart(background.size());
+                Frame* const outputs[] = {&apart, &background, &foreground};
+                Frame& output = *outputs[random() % 3];
+                ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()),
+                          KYV_OK);
+                for (const uint32_t pixel : output) {
+                    hash = (hash ^ pixel) * 1099511628211U;
+                }
+            }
+        }
+    }
+    EXPECT_EQ(hash, 7943080034623530523U);
+}
+
 // An AYUV picture that is keyed is no longer clear where it is not covered, which only a blur of a
 // later frame shows.
 TEST(Freeform, KeyedAyuvPicturesLeaveNothingBehind) {

@@ -14,4 +14,7 @@ struct ProcessUse {
 
 ProcessUse GetProcessUse();
 
+// How often this thread has been given a page of memory. 0 where the system does not tell.
+int64_t GetPageFaults();
+
 } // namespace kyvtest
