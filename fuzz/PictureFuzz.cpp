@@ -1,8 +1,11 @@
-// The picture decoders of the Linux half, fed with anything.
+// The picture decoders of the Linux half and what kyvhost makes of a file, fed with anything.
 #include <algorithm>
 #include <cstdlib>
 #include <vector>
 
+#include "host/Picture.h"
+#include "host/PictureFile.h"
+#include "hosting/ExitStatus.h"
 #include "platform/posix/ImageCodecs.h"
 
 namespace {
@@ -43,10 +46,10 @@ void CheckRoundTrip(const CPixels& picture, bool (*encode)(const PixelRows&, Byt
     }
 }
 
-void Decode(ByteView file) {
+bool Decode(ByteView file) {
     CPixels picture;
     if (!DecodeImage(file, picture)) {
-        return;
+        return false;
     }
     if (picture.pixels.empty()) {
         std::abort();
@@ -55,6 +58,7 @@ void Decode(ByteView file) {
         CheckRoundTrip(picture, EncodePng, DecodePng);
         CheckRoundTrip(picture, EncodeTiff, DecodeTiff);
     }
+    return true;
 }
 
 uint32_t Big(const uint8_t* bytes) {
@@ -85,11 +89,25 @@ void RepairPng(Bytes& file) {
 } // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-    Decode({data, size});
+    const bool decoded = Decode({data, size});
     if (size > 8 && data[0] == 0x89) {
         Bytes repaired(data, data + size);
         RepairPng(repaired);
         Decode({repaired.data(), repaired.size()});
+    }
+    // As a file of kyvhost's, which is turned upright or refused with words for the user.
+    const int orientation = kyvhost::Orientation({data, size});
+    if (orientation < 1 || orientation > 8) {
+        std::abort();
+    }
+    if (decoded) {
+        try {
+            const kyvhost::Picture picture = kyvhost::DecodePicture({data, size}, "input");
+            if (picture.pixels.size() != size_t{4} * picture.width * picture.height) {
+                std::abort();
+            }
+        } catch (const kyvhost::CHostError&) {
+        }
     }
     // As a resource, which has no file header.
     if (size > 14 && data[0] == 'B') {

@@ -207,6 +207,10 @@ private:
 
     void AddJson(CLI::App* verb) { verb->add_flag("--json", m_bJson, "JSON instead of a table"); }
 
+    void AddOverwrite(CLI::App* verb) {
+        verb->add_flag("--overwrite,-y", m_bOverwrite, "replace a result that exists");
+    }
+
     void AddList() { AddJson(AddVerb("list", "Lists the effects.", &CCommandLine::List)); }
 
     void AddInfo() {
@@ -221,10 +225,12 @@ private:
                                        &CCommandLine::RenderFile);
         verb->footer(kRenderFooter);
         AddEffect(verb);
-        verb->add_option("INPUT", m_input, "a PNG or JPEG picture, or a video that ffmpeg reads")
+        verb->add_option("INPUT", m_input,
+                         "a PNG, JPEG, TIFF or BMP picture, or a video that ffmpeg reads")
             ->required()
             ->type_name("");
-        verb->add_option("OUTPUT", m_output, "a .png picture, or a .mp4, .m4v, .mov or .mkv video")
+        verb->add_option("OUTPUT", m_output,
+                         "a .png, .jpg, .tif or .bmp picture, or a .mp4, .m4v, .mov or .mkv video")
             ->required()
             ->type_name("");
         AddText(
@@ -284,6 +290,7 @@ private:
                 [this](const std::string& text) {
                     m_render.tools.ffmpeg = TextOf(ParsePath("--ffmpeg", text));
                 });
+        AddOverwrite(verb);
         verb->add_flag("--quiet,-q", m_render.quiet, "no progress, no notes");
     }
 
@@ -309,11 +316,14 @@ private:
         CLI::App* const verb =
             AddVerb("gallery", "Renders every effect on two pictures into one contact sheet.",
                     &CCommandLine::MakeGallery);
-        verb->add_option("OUTPUT", m_output, "a .png picture")->required()->type_name("");
-        verb->add_option("INPUT", m_input, "a PNG or JPEG picture")->required()->type_name("");
+        verb->add_option("OUTPUT", m_output, "a .png, .jpg, .tif or .bmp picture")
+            ->required()
+            ->type_name("");
+        verb->add_option("INPUT", m_input, "a picture")->required()->type_name("");
         verb->add_option("INPUT2", m_input2, "another one, for effects with two inputs")
             ->required()
             ->type_name("");
+        AddOverwrite(verb);
         AddCommonSettings(verb);
         AddLevel(verb);
         AddText(verb, "--columns", "N", "pictures a row; default: 5",
@@ -345,6 +355,7 @@ private:
         m_render.effect = m_effect;
         m_render.input = ParsePath("INPUT", m_input);
         m_render.output = ParsePath("OUTPUT", m_output);
+        m_render.overwrite = m_bOverwrite;
         const CModule module = Load();
         Render(module.Descriptor(), m_render);
     }
@@ -362,6 +373,7 @@ private:
         m_gallery.input2 = ParsePath("INPUT2", m_input2);
         m_gallery.output = ParsePath("OUTPUT", m_output);
         m_gallery.settings = m_render.settings;
+        m_gallery.overwrite = m_bOverwrite;
         const CModule module = Load();
         Gallery(module.Descriptor(), m_gallery);
     }
@@ -410,6 +422,7 @@ private:
     std::optional<std::string> m_module;
     std::string m_effect, m_input, m_input2, m_output;
     bool m_bJson = false;
+    bool m_bOverwrite = false;
     RenderOptions m_render;
     BenchOptions m_bench;
     GalleryOptions m_gallery;

@@ -1,6 +1,7 @@
 // A running ffmpeg.
 #include "host/Ffmpeg.h"
 
+#include <algorithm>
 #include <system_error>
 #include <utility>
 
@@ -67,6 +68,12 @@ std::string CFfmpeg::LastLine() const {
         }
     }
     return {};
+}
+
+bool CFfmpeg::HasNamed(const std::string& text) const {
+    return std::any_of(m_lines.begin(), m_lines.end(), [&](const std::string& line) {
+        return line.find(text) != std::string::npos;
+    });
 }
 
 void CFfmpeg::CollectLines() {

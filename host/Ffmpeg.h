@@ -30,6 +30,9 @@ public:
     // The most telling line of its standard error; empty when it has said nothing. After Wait.
     std::string LastLine() const;
 
+    // Whether one of its last lines contains the text. After Wait.
+    bool HasNamed(const std::string& text) const;
+
 private:
     void CollectLines();
 

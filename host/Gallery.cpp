@@ -187,10 +187,10 @@ private:
 } // namespace
 
 void Gallery(const ModuleDescriptor& module, const GalleryOptions& options) {
-    if (Lower(TextOf(options.output.extension())) != ".png") {
-        throw CUsageError(TextOf(options.output) + ": name a .png picture");
+    if (!IsPictureName(options.output)) {
+        throw CUsageError(TextOf(options.output) + ": name a .png, .jpg, .tif or .bmp picture");
     }
-    COutputFile output(options.output);
+    COutputFile output(options.output, options.overwrite, {options.input, options.input2});
     const Picture first = ReadPicture(options.input), second = ReadPicture(options.input2);
     const uint32_t tileHeight = std::clamp<uint32_t>(
         std::lround(double(options.tileWidth) * first.height / first.width), 8, 4096);
@@ -205,7 +205,7 @@ void Gallery(const ModuleDescriptor& module, const GalleryOptions& options) {
     for (uint32_t i = 0; i < module.effectCount; ++i) {
         sheet.Add(RenderTile(module.effects[i], options.settings, a, b));
     }
-    WritePng(sheet.Finished(), output.Temporary(), output.Name());
+    WritePicture(sheet.Finished(), output.Temporary(), output.Name());
     output.Commit();
 }
 

@@ -10,6 +10,7 @@ namespace kyvhost {
 struct GalleryOptions {
     std::filesystem::path input, input2, output;
     EffectSettings settings;
+    bool overwrite = false;
     uint32_t columns = 5;
     uint32_t tileWidth = 400; // pixels; the height follows from the first picture's shape
 };

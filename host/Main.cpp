@@ -5,6 +5,7 @@
 
 int main(int argc, char** argv) {
     const std::vector<std::string> arguments = kyv::CommandLineArguments(argc, argv);
+    kyv::FailAtFileSizeLimit();
     kyvhost::WatchForInterrupt();
     return static_cast<int>(kyvhost::RunCommandLine(arguments));
 }

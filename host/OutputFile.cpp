@@ -19,6 +19,10 @@ namespace fs = std::filesystem;
     throw CHostError(ExitStatus::RenderingFailed, TextOf(file) + " cannot be written: " + why);
 }
 
+[[noreturn]] void Exists(const fs::path& file) {
+    throw CUsageError(TextOf(file) + " exists; --overwrite replaces it");
+}
+
 // Where a symbolic link leads, so that the link stays one.
 fs::path TargetOf(const fs::path& file) {
     constexpr int kMostLinks = 40;
@@ -41,9 +45,10 @@ fs::path TemporaryName(const fs::path& target, const fs::path& extension) {
 
 } // namespace
 
-COutputFile::COutputFile(const fs::path& file)
+COutputFile::COutputFile(const fs::path& file, bool overwrite, const std::vector<fs::path>& inputs)
     : m_file(file), m_target(TargetOf(file)),
-      m_temporary(TemporaryName(m_target, file.extension())), m_guard([name = m_temporary] {
+      m_temporary(TemporaryName(m_target, file.extension())), m_bOverwrite(overwrite),
+      m_guard([name = m_temporary] {
           std::error_code error;
           fs::remove(name, error);
       }) {
@@ -61,6 +66,15 @@ COutputFile::COutputFile(const fs::path& file)
     if (fs::exists(m_target, error) && !fs::is_regular_file(m_target, error)) {
         Unwritable(file, "it is no regular file");
     }
+    for (const fs::path& input : inputs) {
+        if (fs::equivalent(input, m_target, error)) {
+            throw CUsageError(TextOf(file) + " is the input " + TextOf(input) +
+                              "; name another file for the result");
+        }
+    }
+    if (!overwrite && fs::exists(m_target, error)) {
+        Exists(file);
+    }
     // Better now than after an hour of rendering.
     errno = 0;
     if (!std::ofstream(m_temporary, std::ios::binary)) {
@@ -76,6 +90,17 @@ COutputFile::~COutputFile() {
 
 void COutputFile::Commit() {
     std::error_code error;
+    if (!m_bOverwrite) {
+        // Unlike a rename this never replaces. Where the file system has no links a check must do.
+        fs::create_hard_link(m_temporary, m_target, error);
+        if (!error) {
+            return;
+        }
+        if (fs::exists(m_target)) {
+            Exists(m_file);
+        }
+        error.clear();
+    }
     fs::rename(m_temporary, m_target, error);
     if (error) {
         Unwritable(m_file, error.message());

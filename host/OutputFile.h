@@ -2,6 +2,7 @@
 #pragma once
 
 #include <filesystem>
+#include <vector>
 
 #include "host/Interrupt.h"
 
@@ -11,8 +12,11 @@ namespace kyvhost {
 // removed at the end, on failure and on interruption.
 class COutputFile {
 public:
-    // A symbolic link stands for its target. Throws CHostError when nothing can be written there.
-    explicit COutputFile(const std::filesystem::path& file);
+    // A symbolic link stands for its target. Throws CHostError when nothing can be written there,
+    // and CUsageError when the file is one of the inputs, under whatever name, or when it exists
+    // and is not to be replaced.
+    COutputFile(const std::filesystem::path& file, bool overwrite,
+                const std::vector<std::filesystem::path>& inputs);
     ~COutputFile();
 
     COutputFile(const COutputFile&) = delete;
@@ -23,12 +27,14 @@ public:
 
     const std::filesystem::path& Temporary() const { return m_temporary; }
 
-    // Gives the temporary file the final name, in place of a file that has it.
+    // Gives the temporary file the final name. A file that has it meanwhile is replaced only when
+    // that was asked for.
     void Commit();
 
 private:
     std::filesystem::path m_file, m_target; // what the user has named, and where it leads
     std::filesystem::path m_temporary;
+    bool m_bOverwrite;
     CInterruptGuard m_guard;
 };
 

@@ -63,7 +63,7 @@ int64_t UnitsOf(double seconds) {
 
 // The kinds of output by the name.
 bool IsStillName(const fs::path& file) {
-    return Lower(TextOf(file.extension())) == ".png";
+    return IsPictureName(file);
 }
 
 VideoCodec CodecFor(const RenderOptions& options) {
@@ -93,7 +93,11 @@ public:
     }
 
     void Run() {
-        COutputFile output(m_options.output);
+        std::vector<fs::path> inputs;
+        for (const Source& source : m_sources) {
+            inputs.push_back(source.file);
+        }
+        COutputFile output(m_options.output, m_options.overwrite, inputs);
         if (IsStillName(m_options.output)) {
             RenderStill(output.Temporary());
         } else {
@@ -152,8 +156,9 @@ void CRendering::CheckOutput() const {
             throw CUsageError("--time is for pictures; a video takes --start and --duration");
         }
     } else {
-        throw CUsageError(TextOf(m_options.output) +
-                          ": name a .png picture or a .mp4, .m4v, .mov or .mkv video");
+        throw CUsageError(
+            TextOf(m_options.output) +
+            ": name a .png, .jpg, .tif or .bmp picture or a .mp4, .m4v, .mov or .mkv video");
     }
 }
 
@@ -246,7 +251,7 @@ void CRendering::RenderStill(const fs::path& file) {
     if (m_options.settings.ayuv) {
         AyuvToBgra(result.pixels.data(), m_shape.Pixels());
     }
-    WritePng(result, file, m_options.output);
+    WritePicture(result, file, m_options.output);
 }
 
 Rational CRendering::ClipRate() const {

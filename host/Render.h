@@ -51,6 +51,7 @@ struct RenderOptions {
     std::optional<Rational> rate;
     std::optional<VideoCodec> codec;
     VideoTools tools;
+    bool overwrite = false;
     bool quiet = false;
 };
 

@@ -40,10 +40,11 @@ std::string SizeText(uint32_t width, uint32_t height) {
     throw CHostError(ExitStatus::InputUnreadable, TextOf(file) + ": " + why);
 }
 
-// ffmpeg names the file in its last line; the user's line has it already.
+// ffmpeg names the file in its last line; the user's line has it already, under its final name.
 std::string WithoutFileName(const std::string& line, const fs::path& file) {
     const std::string prefix = FileArgument(file) + ": ";
-    return line.starts_with(prefix) ? line.substr(prefix.size()) : line;
+    const size_t at = line.find(prefix);
+    return at == std::string::npos ? line : line.substr(at + prefix.size());
 }
 
 // A member that ffprobe writes as text; the fallback when it is missing.
@@ -389,7 +390,8 @@ void CVideoWriter::Write(const uint8_t* frame) {
 
 void CVideoWriter::Finish() {
     m_pFfmpeg->Process().CloseInput();
-    if (m_pFfmpeg->Wait() != 0) {
+    // A disk that fills up with the very last bytes is told in words alone.
+    if (m_pFfmpeg->Wait() != 0 || m_pFfmpeg->HasNamed(FileArgument(m_file))) {
         Fail();
     }
 }

@@ -17,4 +17,8 @@ bool ErrorIsTerminal();
 // thread of its own, so it may lock and allocate. Call this once, before starting other threads.
 void OnInterrupt(std::function<void()> action);
 
+// A file that grows past the system's limit for files makes writing fail from now on, here and in
+// children, in place of ending the program before it can tidy up.
+void FailAtFileSizeLimit();
+
 } // namespace kyv

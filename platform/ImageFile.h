@@ -5,7 +5,9 @@
 // Pixels are B, G, R, A with straight alpha, rows top down. No function here throws.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+#include <vector>
 
 #include "platform/Library.h"
 #include "platform/Status.h"
@@ -45,6 +47,16 @@ bool DecodeResource(LibraryHandle module, const char* type, uint16_t id, CPixelT
 // option is handed to the external decoder, which may change it.
 bool DecodeFile(const char* path, int32_t& decodeOption, CPixelTarget& target);
 bool DecodeFile(const wchar_t* path, int32_t& decodeOption, CPixelTarget& target);
+
+// A picture in any of the formats, in memory. No external decoder is asked.
+bool DecodeMemory(const uint8_t* file, size_t size, CPixelTarget& target);
+
+// The quality of JPEG files where nobody asks for one.
+constexpr int kUsualJpegQuality = 75;
+
+// The bytes of a picture file. quality 1 to 100 is for JPEG alone. kOutOfMemory or kFail.
+Status EncodeMemory(ImageFormat format, const PixelRows& source, int quality,
+                    std::vector<uint8_t>& file);
 
 // Writes a picture file, replacing one that exists. kOutOfMemory or kFail when it cannot.
 Status EncodeFile(const wchar_t* path, ImageFormat format, const PixelRows& source);

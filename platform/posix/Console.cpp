@@ -41,4 +41,8 @@ void OnInterrupt(std::function<void()> action) {
     }).detach();
 }
 
+void FailAtFileSizeLimit() {
+    std::signal(SIGXFSZ, SIG_IGN);
+}
+
 } // namespace kyv

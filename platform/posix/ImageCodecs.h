@@ -35,7 +35,7 @@ bool DecodeDib(ByteView dib, CPixelTarget& target);
 
 // False when memory runs out or the format cannot hold the picture.
 bool EncodePng(const PixelRows& source, Bytes& file);
-bool EncodeJpeg(const PixelRows& source, Bytes& file);
+bool EncodeJpeg(const PixelRows& source, int quality, Bytes& file); // 1 to 100
 bool EncodeTiff(const PixelRows& source, Bytes& file);
 bool EncodeBmp(const PixelRows& source, Bytes& file);
 

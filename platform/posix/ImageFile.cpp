@@ -89,12 +89,12 @@ bool ToUtf8(const wchar_t* text, std::string& utf8) {
     return true;
 }
 
-bool Encode(ImageFormat format, const PixelRows& source, Bytes& file) {
+bool Encode(ImageFormat format, const PixelRows& source, int quality, Bytes& file) {
     switch (format) {
     case ImageFormat::Bmp:
         return EncodeBmp(source, file);
     case ImageFormat::Jpeg:
-        return EncodeJpeg(source, file);
+        return EncodeJpeg(source, quality, file);
     case ImageFormat::Png:
         return EncodePng(source, file);
     case ImageFormat::Tiff:
@@ -152,13 +152,31 @@ bool DecodeFile(const wchar_t* path, int32_t& decodeOption, CPixelTarget& target
     }
 }
 
+bool DecodeMemory(const uint8_t* file, size_t size, CPixelTarget& target) {
+    try {
+        return DecodeImage({file, size}, target);
+    } catch (const std::bad_alloc&) {
+        return false;
+    }
+}
+
+Status EncodeMemory(ImageFormat format, const PixelRows& source, int quality,
+                    std::vector<uint8_t>& file) {
+    try {
+        file.clear();
+        return Encode(format, source, quality, file) ? kOk : kFail;
+    } catch (const std::bad_alloc&) {
+        return kOutOfMemory;
+    }
+}
+
 // The file is made in memory first, so that a picture that cannot be encoded leaves a file of that
 // name alone.
 Status EncodeFile(const wchar_t* path, ImageFormat format, const PixelRows& source) {
     try {
         std::string utf8;
         Bytes bytes;
-        if (!ToUtf8(path, utf8) || !Encode(format, source, bytes)) {
+        if (!ToUtf8(path, utf8) || !Encode(format, source, kUsualJpegQuality, bytes)) {
             return kFail;
         }
         const CFile file(utf8.c_str(), O_WRONLY | O_CREAT | O_TRUNC);

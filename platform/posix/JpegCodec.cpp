@@ -141,7 +141,7 @@ public:
     CJpegWriter(const CJpegWriter&) = delete;
     CJpegWriter& operator=(const CJpegWriter&) = delete;
 
-    bool Encode(const PixelRows& source) {
+    bool Encode(const PixelRows& source, int quality) {
         if (setjmp(m_error.jump)) {
             return false;
         }
@@ -151,7 +151,8 @@ public:
         m_jpeg.image_height = static_cast<JDIMENSION>(source.height);
         m_jpeg.input_components = 4;
         m_jpeg.in_color_space = JCS_EXT_BGRX;
-        jpeg_set_defaults(&m_jpeg); // quality 75, as GDI+
+        jpeg_set_defaults(&m_jpeg);
+        jpeg_set_quality(&m_jpeg, quality, TRUE);
         jpeg_start_compress(&m_jpeg, TRUE);
         while (m_jpeg.next_scanline < m_jpeg.image_height) {
             auto* row = const_cast<uint8_t*>(source.pixels +
@@ -177,9 +178,9 @@ bool DecodeJpeg(ByteView file, CPixelTarget& target) {
     return CJpegReader().Decode(file, target);
 }
 
-bool EncodeJpeg(const PixelRows& source, Bytes& file) {
+bool EncodeJpeg(const PixelRows& source, int quality, Bytes& file) {
     CJpegWriter writer;
-    if (!writer.Encode(source)) {
+    if (!writer.Encode(source, quality)) {
         return false;
     }
     file.assign(writer.File().data, writer.File().data + writer.File().size);

@@ -54,6 +54,7 @@ public:
         sigset_t none, all;
         sigemptyset(&none);
         sigfillset(&all);
+        sigdelset(&all, SIGXFSZ); // as it is with us: see FailAtFileSizeLimit
         posix_spawnattr_setsigmask(&m_attributes, &none);
         posix_spawnattr_setsigdefault(&m_attributes, &all);
         posix_spawnattr_setpgroup(&m_attributes, 0);

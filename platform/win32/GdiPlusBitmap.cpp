@@ -88,12 +88,18 @@ bool CGdiPlusBitmap::Save(const wchar_t* path, const CLSID& encoder) const {
            Gdip::GdipSaveImageToFile(m_pBitmap, path, &encoder, nullptr) == Gdiplus::Ok;
 }
 
-CGdiPlusBitmapResource::~CGdiPlusBitmapResource() {
+bool CGdiPlusBitmap::Save(IStream* stream, const CLSID& encoder,
+                          const Gdiplus::EncoderParameters* parameters) const {
+    return m_pBitmap &&
+           Gdip::GdipSaveImageToStream(m_pBitmap, stream, &encoder, parameters) == Gdiplus::Ok;
+}
+
+CGdiPlusBitmapMemory::~CGdiPlusBitmapMemory() {
     Release();
     ReleaseBlock();
 }
 
-void CGdiPlusBitmapResource::ReleaseBlock() {
+void CGdiPlusBitmapMemory::ReleaseBlock() {
     if (m_hBlock) {
         GlobalUnlock(m_hBlock);
         GlobalFree(m_hBlock);
@@ -101,14 +107,18 @@ void CGdiPlusBitmapResource::ReleaseBlock() {
     }
 }
 
-void CGdiPlusBitmapResource::Load(HMODULE module, const char* type, uint16_t id) {
-    Release();
-    ReleaseBlock();
+void CGdiPlusBitmapMemory::LoadResource(HMODULE module, const char* type, uint16_t id) {
     const HRSRC resource = FindResourceA(module, MAKEINTRESOURCEA(id), type);
     const DWORD size = resource ? SizeofResource(module, resource) : 0;
-    const HGLOBAL loaded = size ? LoadResource(module, resource) : nullptr;
+    const HGLOBAL loaded = size ? ::LoadResource(module, resource) : nullptr;
     const void* const bytes = loaded ? LockResource(loaded) : nullptr;
-    CMemorySource source(bytes, bytes ? size : 0);
+    Load(bytes, bytes ? size : 0);
+}
+
+void CGdiPlusBitmapMemory::Load(const void* bytes, size_t size) {
+    Release();
+    ReleaseBlock();
+    CMemorySource source(bytes, size);
     m_hBlock = HasSaneSize(source) ? GlobalAlloc(GMEM_MOVEABLE, size) : nullptr;
     if (!m_hBlock) {
         return;

@@ -50,20 +50,27 @@ public:
     // False when there is no bitmap or GDI+ cannot write the file.
     bool Save(const wchar_t* path, const CLSID& encoder) const;
 
+    // The same into a stream; parameters may be null.
+    bool Save(IStream* stream, const CLSID& encoder,
+              const Gdiplus::EncoderParameters* parameters) const;
+
 protected:
     void Release();
 
     Gdiplus::GpBitmap* m_pBitmap = nullptr;
 };
 
-// A bitmap decoded from a resource, with the memory block behind its stream: GDI+ may read the
-// stream as late as when the pixels are asked for.
-class CGdiPlusBitmapResource : public CGdiPlusBitmap {
+// A bitmap decoded from memory, with the memory block behind its stream: GDI+ may read the stream
+// as late as when the pixels are asked for.
+class CGdiPlusBitmapMemory : public CGdiPlusBitmap {
 public:
-    CGdiPlusBitmapResource() = default;
-    ~CGdiPlusBitmapResource() override;
+    CGdiPlusBitmapMemory() = default;
+    ~CGdiPlusBitmapMemory() override;
 
-    void Load(HMODULE module, const char* type, uint16_t id);
+    // Copies the bytes.
+    void Load(const void* bytes, size_t size);
+
+    void LoadResource(HMODULE module, const char* type, uint16_t id);
 
 private:
     void ReleaseBlock();

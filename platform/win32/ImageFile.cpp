@@ -85,8 +85,18 @@ bool DecodeResource(LibraryHandle module, const char* type, uint16_t id, CPixelT
     if (!session.IsStarted() || !type) {
         return false;
     }
-    CGdiPlusBitmapResource bitmap;
-    bitmap.Load(static_cast<HMODULE>(module), type, id);
+    CGdiPlusBitmapMemory bitmap;
+    bitmap.LoadResource(static_cast<HMODULE>(module), type, id);
+    return bitmap.CopyTo(target);
+}
+
+bool DecodeMemory(const uint8_t* file, size_t size, CPixelTarget& target) {
+    const CGdiPlusSession session;
+    if (!session.IsStarted() || !file) {
+        return false;
+    }
+    CGdiPlusBitmapMemory bitmap;
+    bitmap.Load(file, size);
     return bitmap.CopyTo(target);
 }
 
@@ -134,6 +144,53 @@ Status EncodeFile(const wchar_t* path, ImageFormat format, const PixelRows& sour
         return kFail;
     }
     return kOk;
+}
+
+namespace {
+
+struct ReleaseStream {
+    void operator()(IStream* stream) const { stream->Release(); }
+};
+
+bool ReadAll(IStream* stream, std::vector<uint8_t>& file) {
+    STATSTG status = {};
+    ULONG count = 0;
+    if (FAILED(stream->Stat(&status, STATFLAG_NONAME)) || status.cbSize.HighPart != 0 ||
+        FAILED(stream->Seek({}, STREAM_SEEK_SET, nullptr))) {
+        return false;
+    }
+    file.resize(status.cbSize.LowPart);
+    return SUCCEEDED(stream->Read(file.data(), status.cbSize.LowPart, &count)) &&
+           count == file.size();
+}
+
+} // namespace
+
+Status EncodeMemory(ImageFormat format, const PixelRows& source, int quality,
+                    std::vector<uint8_t>& file) {
+    const CGdiPlusSession session;
+    IStream* made = nullptr;
+    if (!session.IsStarted() || CreateStreamOnHGlobal(nullptr, TRUE, &made) != S_OK) {
+        return kFail;
+    }
+    const std::unique_ptr<IStream, ReleaseStream> stream(made);
+    CGdiPlusBitmap bitmap;
+    bitmap.Wrap(source);
+    CLSID encoder;
+    ULONG value = static_cast<ULONG>(quality);
+    Gdiplus::EncoderParameters parameters = {};
+    parameters.Count = 1;
+    parameters.Parameter[0] = {Gdiplus::EncoderQuality, 1, Gdiplus::EncoderParameterValueTypeLong,
+                               &value};
+    if (FindEncoder(MimeType(format), encoder) < 0 ||
+        !bitmap.Save(stream.get(), encoder, format == ImageFormat::Jpeg ? &parameters : nullptr)) {
+        return kFail;
+    }
+    try {
+        return ReadAll(stream.get(), file) ? kOk : kFail;
+    } catch (const std::bad_alloc&) {
+        return kOutOfMemory;
+    }
 }
 
 } // namespace kyv

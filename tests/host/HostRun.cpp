@@ -96,7 +96,7 @@ std::string HostTest::Write(const std::string& name, uint32_t width,
     picture.height = static_cast<uint32_t>(pixels.size()) / width;
     picture.pixels.resize(pixels.size() * 4);
     std::memcpy(picture.pixels.data(), pixels.data(), picture.pixels.size());
-    kyvhost::WritePng(picture, Path(name), name);
+    kyvhost::WritePicture(picture, Path(name), name);
     return Path(name);
 }
 

@@ -38,8 +38,8 @@ TEST_F(LanguageTest, NamesAreTranslatedAndCommandsAreNot) {
     Write("in.png", 2, {0xFF000000, 0xFFFFFFFF});
     for (const char* effect : {"bubble", "Seifenblasen"}) {
         for (const char* value : {"P3=1", "Blasendichte=1", "density=1"}) {
-            const HostResult result = RunIn(
-                "de_DE.UTF-8", {"render", effect, Path("in.png"), Path("out.png"), "--set", value});
+            const HostResult result = RunIn("de_DE.UTF-8", {"render", effect, "-y", Path("in.png"),
+                                                            Path("out.png"), "--set", value});
             EXPECT_EQ(result.status, 0) << result.error;
         }
     }

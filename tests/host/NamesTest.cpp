@@ -74,7 +74,7 @@ TEST_F(NamesTest, ServeTheCommandLineInBothLanguages) {
     // 100 becomes 59, 118 and 192 for the reference #FF8000 (RenderTest has the sums).
     for (const char* effect : {"white-balance", "white", "Wei\u00DFabgleich", "abgleich"}) {
         for (const char* param : {"reference point=", "Referenzfarbe=", "referenz="}) {
-            const HostResult result = Run({"render", effect, Path("in.png"), Path("out.png"),
+            const HostResult result = Run({"render", effect, "-y", Path("in.png"), Path("out.png"),
                                            "--set", std::string(param) + "#FF8000"});
             EXPECT_EQ(result.status, 0) << effect << ' ' << param << result.error;
             EXPECT_THAT(Read("out.png"), testing::ElementsAre(0xFF3B76C0))

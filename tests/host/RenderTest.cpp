@@ -1,4 +1,5 @@
 // Pictures through kyvhost, from file to file.
+#include <array>
 #include <bit>
 #include <cstring>
 #include <fstream>
@@ -45,7 +46,8 @@ protected:
     // Renders with the probe and gives the words that it wrote.
     std::vector<uint32_t> Probe(const std::vector<std::string>& options) {
         Write("in.png", 20, Ramp(20, 3));
-        std::vector<std::string> arguments = {"render", "probe", Path("in.png"), Path("out.png")};
+        std::vector<std::string> arguments = {"render", "probe", "--overwrite", Path("in.png"),
+                                              Path("out.png")};
         arguments.insert(arguments.end(), options.begin(), options.end());
         const HostResult result = RunHostWith(ProbeModule(), arguments);
         EXPECT_EQ(result.status, 0) << result.error;
@@ -62,7 +64,7 @@ TEST_F(RenderTest, PixelsOfTheWhiteBalance) {
     Write("in.png", 2, {0x11FF8000, 0xFF646464});
     for (const char* level : {"0", "3", "5"}) {
         for (const char* name : {"P1=#FF8000", "reference point=#ff8000"}) {
-            const HostResult result = RunHost({"render", "white-balance", Path("in.png"),
+            const HostResult result = RunHost({"render", "white-balance", "-y", Path("in.png"),
                                                Path("out.png"), "--set", name, "--level", level});
             EXPECT_EQ(result.status, 0) << result.error;
             EXPECT_THAT(Read("out.png"), ElementsAre(0x11989898, 0xFF3B76C0));
@@ -76,7 +78,7 @@ TEST_F(RenderTest, EffectsAreFoundByEveryName) {
     for (const char* name :
          {"11", "Kyv_Dsp_Co_WhiteBalance", "White Balance", "whitebalance", "white"}) {
         const HostResult result =
-            RunHost({"render", name, Path("in.png"), Path("out.png"), "--set", "P1=#FF8000"});
+            RunHost({"render", name, "-y", Path("in.png"), Path("out.png"), "--set", "P1=#FF8000"});
         EXPECT_EQ(result.status, 0) << result.error;
         EXPECT_THAT(Read("out.png"), ElementsAre(0xFF3B76C0)) << name;
     }
@@ -244,6 +246,10 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
         std::ofstream(Path("cut.png"), std::ios::binary) << bytes.substr(0, bytes.size() - 20);
     }
     std::filesystem::create_directory(Path("folder.png"));
+    // A table of Huffman codes that claims 257 of them.
+    std::ofstream(Path("codes.jpg"), std::ios::binary)
+        << std::string("\xFF\xD8\xFF\xC4\x01\x14\0\0\0\0\0\0\0\0\x80\x80\x01", 17)
+        << std::string(8 + 257, '\0') << "\xFF\xDA\xFF\xD9";
     const std::vector<std::string> files = Files();
     const std::string probe = ProbeModule();
     struct Case {
@@ -314,9 +320,10 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
         {{"render", "11", in, Path("folder.png")}, 1, {"folder.png cannot be written", "folder;"}},
         {{"render", "11", in, in + "/out.png"}, 1, {"in.png/out.png cannot be written: "}},
         {{"render", "11", Path("none.png"), out}, 3, {"none.png", "no such file"}},
-        {{"render", "11", Path("text.png"), out}, 3, {"text.png", "no PNG or JPEG"}},
+        {{"render", "11", Path("text.png"), out}, 3, {"text.png", "no PNG, JPEG, TIFF or BMP"}},
         {{"render", "11", Path("empty.jpg"), out}, 3, {"empty.jpg", "empty"}},
         {{"render", "11", Path("cut.png"), out}, 3, {"cut.png", "cut off"}},
+        {{"render", "11", Path("codes.jpg"), out}, 3, {"codes.jpg", "broken"}},
         {{"list", "--module", Path("none.so")}, 4, {"none.so", "no such file"}},
         {{"list", "--module", in}, 4, {"in.png", "cannot be loaded"}},
         {{"list", "--module", EmptyModule()}, 4, {"KYV_DSP_InitModule"}},
@@ -342,14 +349,87 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
 
 TEST_F(RenderTest, AFailureKeepsTheOldResult) {
     const std::string in = Write("in.png", 3, Ramp(3, 2));
-    Write("out.png", 1, {0xFF123456});
-    const HostResult failed = RunHostWith(
-        ProbeModule(), {"render", "probe", in, Path("out.png"), "--set", "mode=no_process"});
-    EXPECT_EQ(failed.status, 1);
+    const std::string out = Write("out.png", 1, {0xFF123456});
+    const auto render = [&](const std::vector<std::string>& options) {
+        std::vector<std::string> arguments = {"render", "probe", in, out};
+        arguments.insert(arguments.end(), options.begin(), options.end());
+        return RunHostWith(ProbeModule(), arguments);
+    };
+    EXPECT_EQ(render({"--overwrite", "--set", "mode=no_process"}).status, 1);
     EXPECT_THAT(Read("out.png"), ElementsAre(0xFF123456));
-    EXPECT_EQ(RunHostWith(ProbeModule(), {"render", "probe", in, Path("out.png")}).status, 0);
+    const HostResult refused = render({});
+    EXPECT_EQ(refused.status, 2);
+    EXPECT_THAT(refused.error, HasSubstr("out.png exists; --overwrite replaces it"));
+    EXPECT_THAT(Read("out.png"), ElementsAre(0xFF123456));
+    EXPECT_EQ(render({"-y"}).status, 0);
     EXPECT_EQ(Read("out.png").size(), 6U);
     EXPECT_THAT(Files(), ElementsAre("in.png", "out.png"));
+}
+
+TEST_F(RenderTest, AnInputIsNeverTheOutput) {
+    const std::vector<uint32_t> ramp = Ramp(3, 2);
+    const std::string in = Write("in.png", 3, ramp), other = Write("other.png", 3, ramp);
+    const std::string aside = Path(".") + "/in.png";
+    const std::vector<std::vector<std::string>> cases = {
+        {"render", "11", in, in},
+        {"render", "11", in, aside},
+        {"render", "alpha-transition", other, in, "--input2", aside},
+        {"gallery", aside, other, in},
+    };
+    for (std::vector<std::string> arguments : cases) {
+        arguments.emplace_back("--overwrite");
+        const HostResult result = RunHost(arguments);
+        EXPECT_EQ(result.status, 2) << result.error;
+        EXPECT_THAT(result.error, HasSubstr("name another file for the result"));
+        EXPECT_EQ(Read("in.png"), ramp);
+    }
+    EXPECT_THAT(Files(), ElementsAre("in.png", "other.png"));
+}
+
+TEST_F(RenderTest, PicturesComeAndGoInEveryFormat) {
+    const std::vector<uint32_t> ramp = Ramp(24, 16);
+    Write("in.png", 24, ramp);
+    for (const char* name : {"a.bmp", "a.tif", "a.tiff", "a.jpg", "a.jpeg"}) {
+        const HostResult made = RunHost({"render", "11", Path("in.png"), Path(name)});
+        EXPECT_EQ(made.status, 0) << made.error;
+        const HostResult back = RunHost({"render", "11", Path(name), Path("out.png"), "-y"});
+        EXPECT_EQ(back.status, 0) << back.error;
+        const std::vector<uint32_t> pixels = Read("out.png");
+        ASSERT_EQ(pixels.size(), ramp.size()) << name;
+        if (name[2] != 'j') {
+            EXPECT_EQ(pixels, ramp) << name;
+            continue;
+        }
+        for (size_t i = 0; i < ramp.size(); ++i) { // green: nothing but the codec's loss
+            EXPECT_NEAR(pixels[i] >> 8 & 0xFF, ramp[i] >> 8 & 0xFF, 40) << name << i;
+        }
+    }
+}
+
+TEST_F(RenderTest, CamerasTurnTheirPictures) {
+    // A TIFF of one row, red and blue, stored turned: orientation 6 is shown as a column with the
+    // first pixel on top, 8 as one with it at the bottom.
+    const auto tiff = [](uint8_t orientation) {
+        const std::vector<std::array<uint32_t, 3>> entries = {
+            {256, 3, 2},   {257, 3, 1},           {258, 3, 8}, {259, 3, 1}, {262, 3, 2},
+            {273, 4, 146}, {274, 3, orientation}, {277, 3, 3}, {278, 3, 1}, {279, 4, 6}};
+        std::string bytes("II*\0\x08\0\0\0\x0A\0", 10);
+        for (const auto& [tag, type, value] : entries) {
+            for (const uint32_t word : {tag | type << 16, 1U, value}) {
+                for (int shift = 0; shift < 32; shift += 8) {
+                    bytes += static_cast<char>(word >> shift);
+                }
+            }
+        }
+        return bytes + std::string(16, '\0') + std::string("\xFF\0\0\0\0\xFF", 6);
+    };
+    for (const auto& [orientation, expected] :
+         {std::pair{6, std::vector<uint32_t>{0xFFFF0000, 0xFF0000FF}},
+          std::pair{8, std::vector<uint32_t>{0xFF0000FF, 0xFFFF0000}}}) {
+        std::ofstream(Path("in.tif"), std::ios::binary) << tiff(static_cast<uint8_t>(orientation));
+        EXPECT_EQ(Read("in.tif"), expected);
+        EXPECT_EQ(kyvhost::ReadPicture(Path("in.tif")).width, 1U);
+    }
 }
 
 TEST_F(RenderTest, HelpTellsTheStatuses) {

@@ -31,5 +31,34 @@ TEST_F(UnixTest, OutputThatIsLostIsAFailure) {
     }
 }
 
+TEST_F(UnixTest, AnInputByAnotherNameIsStillTheInput) {
+    const std::vector<uint32_t> ramp = Ramp(3, 2);
+    const std::string in = Write("in.png", 3, ramp);
+    std::filesystem::create_hard_link(in, Path("hard.png"));
+    std::filesystem::create_symlink("in.png", Path("soft.png"));
+    for (const char* name : {"hard.png", "soft.png"}) {
+        for (const auto& [from, to] : {std::pair{in, Path(name)}, std::pair{Path(name), in}}) {
+            const HostResult result = RunHost({"render", "11", from, to, "--overwrite"});
+            EXPECT_EQ(result.status, 2) << result.error;
+            EXPECT_EQ(Read("in.png"), ramp);
+        }
+    }
+    EXPECT_THAT(Files(), testing::ElementsAre("hard.png", "in.png", "soft.png"));
+}
+
+// Files of at most 4 KiB: writing fails, and the signal that would end the program does not.
+TEST_F(UnixTest, TheLimitForFilesLeavesNothingBehind) {
+    Write("in.png", 16, Ramp(16, 9));
+    for (const char* arguments : {"gallery out.png in.png in.png --width 200",
+                                  "render bubble in.png out.mkv --codec ffv1 --duration 9"}) {
+        const HostResult result = RunProgram(
+            "bash", {"-c", "cd \"$1\"; ulimit -f 4; exec \"$0\" " + std::string(arguments),
+                     HostFile(), Path("")});
+        EXPECT_EQ(result.status, 1) << result.error;
+        EXPECT_THAT(result.error, testing::HasSubstr("File too large")) << arguments;
+        EXPECT_THAT(Files(), testing::ElementsAre("in.png")) << arguments;
+    }
+}
+
 } // namespace
 } // namespace kyvtest

@@ -405,7 +405,7 @@ std::vector<std::pair<const char*, Bytes>> SampleFiles() {
     std::vector<std::pair<const char*, Bytes>> files = {
         {"PNG", {}}, {"JPEG", {}}, {"TIFF", {}}, {"BMP", {}}};
     EXPECT_TRUE(EncodePng(rows, files[0].second));
-    EXPECT_TRUE(EncodeJpeg(rows, files[1].second));
+    EXPECT_TRUE(EncodeJpeg(rows, 90, files[1].second));
     EXPECT_TRUE(EncodeTiff(rows, files[2].second));
     EXPECT_TRUE(EncodeBmp(rows, files[3].second));
     return files;
