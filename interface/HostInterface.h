@@ -142,6 +142,29 @@ typedef struct EffectCallbacks {
 
 // ---------------------------------------------------------------------------------- descriptors
 
+// EffectProperties::family.
+enum EffectFamily {
+    EffectFamily_ParticleOrStyle = 10,
+    EffectFamily_Transition = 20,
+    EffectFamily_PictureInPicture = 40,
+    EffectFamily_Color = 50,
+};
+
+// EffectProperties::familyVariant, which tells families with the same number apart.
+enum EffectFamilyVariant {
+    EffectFamilyVariant_Style = 1,
+    EffectFamilyVariant_Particle = 4,
+    EffectFamilyVariant_Transition = 58,
+    EffectFamilyVariant_PictureInPicture = 150,
+    EffectFamilyVariant_Color = 200,
+};
+
+// EffectProperties::familyClass.
+enum EffectFamilyClass {
+    EffectFamilyClass_Changed = 2,  // style and colour: the picture itself is changed
+    EffectFamilyClass_Composed = 3, // particle, picture-in-picture, transition: something is added
+};
+
 // Bits of EffectProperties::capabilities.
 enum EffectCapability {
     EffectCapability_Frames = 0x001,     // renders frames in memory: every effect
@@ -152,9 +175,8 @@ enum EffectCapability {
 // Declarations for the host; no callback reads them. Fields without a settled meaning keep their
 // offset as a name.
 typedef struct EffectProperties {
-    uint32_t family;        // 0x00  10 particle or style, 20 transition, 40 picture-in-picture,
-                            //       50 colour
-    uint32_t familyVariant; // 0x04  tells families with the same number apart
+    uint32_t family;        // 0x00  enum EffectFamily
+    uint32_t familyVariant; // 0x04  enum EffectFamilyVariant
     uint32_t property30;    // 0x08  named by its offset in the effect record, as are those below
     uint32_t property34;    // 0x0c
     uint32_t inputCount;    // 0x10  input frames: 1 or 2
@@ -169,7 +191,7 @@ typedef struct EffectProperties {
     uint32_t property5c;    // 0x34
     uint32_t property60;    // 0x38
     uint32_t property64;    // 0x3c
-    uint32_t familyClass;   // 0x40  3 particle, picture-in-picture, transition; 2 style, colour
+    uint32_t familyClass;   // 0x40  enum EffectFamilyClass
 } EffectProperties;
 
 struct EffectDescriptor {
@@ -198,7 +220,7 @@ struct ModuleDescriptor {
     KyvModuleHandle ModuleHandle;    // 0x28  this library, set when it is loaded
     KyvModuleHandle ResourceLibrary; // 0x30  the language library, or ModuleHandle when there is
                                      //       none; null outside InitModule .. DeInitModule
-    uint32_t effectCount;            // 0x38  12
+    uint32_t effectCount;            // 0x38
     uint32_t reserved3c;             // 0x3c
     const EffectDescriptor* effects; // 0x40  effectCount records
 };

@@ -1,6 +1,8 @@
 // The module's descriptor and what happens to it when the library is loaded.
 #include "module/Module.h"
 
+#include <iterator>
+
 #include "module/EffectTable.h"
 #include "platform/LibraryEntry.h"
 #include "platform/Status.h"
@@ -21,7 +23,7 @@ constinit ModuleDescriptor g_module = {
     .vendor = "Module Vendor",
     .ModuleHandle = nullptr,
     .ResourceLibrary = nullptr,
-    .effectCount = kEffectCount,
+    .effectCount = std::size(kEffects),
     .reserved3c = 0,
     .effects = kEffects,
 };

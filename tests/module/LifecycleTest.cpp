@@ -1,4 +1,4 @@
-// The calling protocol, for all twelve effects alike.
+// The calling protocol, for all effects alike.
 #include <algorithm>
 #include <array>
 #include <random>
@@ -17,9 +17,10 @@ protected:
     const EffectDescriptor& effect() const { return Module().effects[GetParam()]; }
 };
 
-INSTANTIATE_TEST_SUITE_P(AllEffects, Lifecycle, testing::Range(0U, 12U), [](const auto& entry) {
-    return std::string(Module().effects[entry.param].identifier);
-});
+INSTANTIATE_TEST_SUITE_P(AllEffects, Lifecycle, testing::Range(0U, Module().effectCount),
+                         [](const auto& entry) {
+                             return std::string(Module().effects[entry.param].identifier);
+                         });
 
 size_t ParamBytes(const EffectDescriptor& effect) {
     size_t bytes = 0;
