@@ -21,7 +21,7 @@ void BlurInPlace(const CImageBase& image, int32_t radius) {
     }
     CImageARGB copy(block.GetData(), image.GetWidth(), image.GetHeight(),
                     static_cast<int32_t>(rowBytes));
-    copy.SetCpuLevel(image.GetCpuLevel());
+    copy.TakeCpuLevel(image);
     for (int32_t y = 0; y < image.GetHeight(); ++y) {
         std::memcpy(copy.Row(y), image.Row(y), rowBytes);
     }

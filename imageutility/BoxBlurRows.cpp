@@ -91,7 +91,7 @@ bool CBoxBlurRows::BlurImage(const KYVImageUtility::CImageBase& source,
         }
         return true;
     }
-    if (!Begin(source.GetWidth(), height, radius, Resolve(source.GetCpuLevel()))) {
+    if (!Begin(source.GetWidth(), height, radius, source.GetInstructionSet())) {
         return false;
     }
     for (int32_t y = 0; y < radius; ++y) {

@@ -17,7 +17,8 @@ CImageBase::CImageBase() : CImageBase(nullptr, 0, 0, 0, 0) {}
 CImageBase::CImageBase(uint8_t* pixels, int32_t width, int32_t height, int32_t pitch,
                        int32_t bytesPerPixel)
     : m_pBuffer(pixels), m_nWidth(width), m_nHeight(height), m_nPitch(pitch),
-      m_nBytesPerPixel(bytesPerPixel), m_bOwnsBuffer(0), m_nDecodeOption(0), m_nCpuLevel(1) {}
+      m_nBytesPerPixel(bytesPerPixel), m_bOwnsBuffer(0),
+      m_nDecodeOption(0), m_cpuLevel{1, kyv::InstructionSet::Scalar} {}
 
 CImageBase::CImageBase(int32_t width, int32_t height, int32_t pitch, int32_t bytesPerPixel,
                        uint32_t* result)
@@ -85,7 +86,7 @@ void CImageBase::FillBytes(uint8_t value) {
 }
 
 int32_t CImageBase::SetCpuLevel(int32_t level) {
-    m_nCpuLevel = level;
+    m_cpuLevel = kyv::ResolveLevel(level);
     return 0;
 }
 

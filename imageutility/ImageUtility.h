@@ -20,6 +20,8 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "platform/CpuFeatures.h"
+
 namespace KYVImageUtility {
 
 class CImageBase {
@@ -65,7 +67,12 @@ public:
 
     // The ceiling for vector code: below 3 scalar, 3 SSE2, from 4 SSSE3 and above. Returns 0.
     int32_t SetCpuLevel(int32_t level);
-    int32_t GetCpuLevel() const { return m_nCpuLevel; }
+    int32_t GetCpuLevel() const { return m_cpuLevel.level; }
+    // As it was resolved before: the level of a callback, or that of another image.
+    void TakeCpuLevel(const kyv::ResolvedLevel& level) { m_cpuLevel = level; }
+    void TakeCpuLevel(const CImageBase& other) { m_cpuLevel = other.m_cpuLevel; }
+    const kyv::ResolvedLevel& GetResolvedLevel() const { return m_cpuLevel; }
+    kyv::InstructionSet GetInstructionSet() const { return m_cpuLevel.set; }
 
     // A number handed to the image-file decoder.
     void SetDecodeOption(int32_t option) { m_nDecodeOption = option; }
@@ -97,7 +104,22 @@ private:
     int32_t m_nBytesPerPixel;
     int32_t m_bOwnsBuffer;
     int32_t m_nDecodeOption;
-    int32_t m_nCpuLevel;
+    kyv::ResolvedLevel m_cpuLevel;
+};
+
+enum ResizeMode : int32_t {
+    ResizeMode_Bilinear = 0, // with 7 bits of fraction; every effect uses this one
+    ResizeMode_RowPick = 1,  // equal widths only, each row a copy of the nearest. What the
+                             // destination's pitch has beyond its width is set to 0, in the last
+                             // row too, so not for views.
+    ResizeMode_Cubic = 2,    // four taps each way: passes through the samples, rounded and clamped
+};
+
+enum SpriteMode : int32_t {
+    SpriteMode_AlphaBlend = 0,
+    SpriteMode_AddBlend = 1,
+    SpriteMode_CompositeOver = 7,
+    SpriteMode_CompositeOpaque = 8, // CompositeOver, and then the rectangle's alpha is 255
 };
 
 class CImageARGB;
@@ -143,12 +165,8 @@ public:
     void FromHSL(const CImageByte& hue, const CImageByte& saturation, const CImageByte& lightness);
 
     // Scales the whole image into the whole destination, whose memory must be another. Both must
-    // be at least 2 x 2. Alpha is scaled like a colour.
-    //   0  bilinear, with 7 bits of fraction; every effect uses this one
-    //   1  row pick: equal widths only, each row a copy of the nearest. What the destination's
-    //      pitch has beyond its width is set to 0, in the last row too, so not for views.
-    //   2  four taps each way: a cubic that passes through the samples, rounded and clamped
-    // Any other mode does nothing.
+    // be at least 2 x 2. Alpha is scaled like a colour. The mode is a ResizeMode; any other number
+    // does nothing.
     void Resize(CImageARGB& destination, int32_t mode) const;
     // The same; false when nothing was written, for callers that go on with the result.
     bool TryResize(CImageARGB& destination, int32_t mode) const;
@@ -168,12 +186,12 @@ public:
     void CompositeOver(const CImageARGB& source, uint8_t opacity);
 
     // Scales the sprite into the rectangle and blends it there; positions and sizes in pixels are
-    // truncated. Modes: 0 AlphaBlend, 1 AddBlend, 7 CompositeOver, 8 CompositeOver and then an
-    // opaque result; any other paints opaque red, as a sign of a mode that does not exist.
+    // truncated. The mode is a SpriteMode; any other number paints the rectangle opaque red, as a
+    // sign of a mode that does not exist.
     // At an edge only the part of the sprite inside is drawn, if it is more than 2 pixels each way
     // in the sprite and in this image. A sprite or a rectangle of less than 2 pixels cannot be
-    // scaled and draws nothing, nor does a position that is not a number. This image's level
-    // rules throughout.
+    // scaled and is not drawn, whatever the mode but an unknown one, which needs no picture; and
+    // nothing is drawn at a position that is not a number. This image's level rules throughout.
     // Throws std::bad_alloc, with nothing drawn.
     void DrawSprite(const CImageARGB& sprite, int32_t mode, float x, float y, float w, float h,
                     uint8_t opacity);

@@ -215,11 +215,11 @@ bool CImageARGB::TryResize(CImageARGB& destination, int32_t mode) const {
         return false;
     }
     switch (mode) {
-    case 0:
+    case ResizeMode_Bilinear:
         return ResizeBilinear(*this, destination);
-    case 1:
+    case ResizeMode_RowPick:
         return ResizeRowPick(*this, destination);
-    case 2:
+    case ResizeMode_Cubic:
         return ResizeCubic(*this, destination);
     default:
         return false;

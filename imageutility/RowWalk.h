@@ -42,7 +42,7 @@ void WalkRowPairs(Row row, const CImageBase& destination, const CImageBase& sour
 // The form of an operation that an image's level asks for.
 template <class Function>
 Function FormFor(const kyv::KernelTable<Function>& table, const CImageBase& image) {
-    return table.For(kyv::Resolve(image.GetCpuLevel()));
+    return table.For(image.GetInstructionSet());
 }
 
 } // namespace KYVImageUtility

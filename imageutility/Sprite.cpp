@@ -46,21 +46,22 @@ bool TakeVisiblePart(CImageARGB& part, const CImageARGB& sprite, const SpriteRec
 }
 
 bool IsBlendMode(int32_t mode) {
-    return mode == 0 || mode == 1 || mode == 7 || mode == 8;
+    return mode == SpriteMode_AlphaBlend || mode == SpriteMode_AddBlend ||
+           mode == SpriteMode_CompositeOver || mode == SpriteMode_CompositeOpaque;
 }
 
 void BlendSprite(CImageARGB& view, const CImageARGB& image, int32_t mode, uint8_t opacity) {
     switch (mode) {
-    case 0:
+    case SpriteMode_AlphaBlend:
         view.AlphaBlend(image, opacity);
         break;
-    case 1:
+    case SpriteMode_AddBlend:
         view.AddBlend(image, opacity);
         break;
-    case 7:
+    case SpriteMode_CompositeOver:
         view.CompositeOver(image, opacity);
         break;
-    case 8:
+    case SpriteMode_CompositeOpaque:
         view.CompositeOver(image, opacity);
         view.SetAlpha(255);
         break;
@@ -89,19 +90,19 @@ void CImageARGB::DrawSprite(const CImageARGB& sprite, int32_t mode, float x, flo
     if (GetSubImage(view, rect.x, rect.y, rect.w, rect.h) == 0 || !HasPixels(view)) {
         return;
     }
-    view.SetCpuLevel(GetCpuLevel());
+    view.TakeCpuLevel(*this);
     CImageARGB part;
     if (view.GetWidth() == rect.w && view.GetHeight() == rect.h) {
         sprite.GetSubImage(part, 0, 0, sprite.GetWidth(), sprite.GetHeight());
     } else if (!TakeVisiblePart(part, sprite, rect, view)) {
         return;
     }
-    part.SetCpuLevel(GetCpuLevel());
+    part.TakeCpuLevel(*this);
     CImageARGB scaled;
     scaled.Create(view.GetWidth(), view.GetHeight());
     // When nothing could be scaled, what was allocated has never been written. The sign of an
     // unknown mode needs no picture.
-    if (part.TryResize(scaled, 0) || !IsBlendMode(mode)) {
+    if (part.TryResize(scaled, ResizeMode_Bilinear) || !IsBlendMode(mode)) {
         BlendSprite(view, scaled, mode, opacity);
     }
 }

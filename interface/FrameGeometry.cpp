@@ -35,6 +35,7 @@ bool GetFrameGeometry(const EffectContext& context, FrameGeometry& geometry) {
     geometry.viewOffset = context.stereoLayout == StereoLayout_RightHalf ? viewBytes : 0;
     geometry.layout = stereo ? context.stereoLayout : uint32_t{StereoLayout_Mono};
     geometry.frameBytes = static_cast<size_t>(geometry.pitchBytes) * context.height;
+    geometry.level = ResolveLevel(context.cpuLevel);
     return true;
 }
 
@@ -61,11 +62,10 @@ DisplaySize GetDisplaySize(const EffectContext& context, const FrameGeometry& ge
     return {width, height, false};
 }
 
-KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,
-                                   void* frame) {
+KYVImageUtility::CImageARGB ViewOf(const FrameGeometry& geometry, void* frame) {
     KYVImageUtility::CImageARGB view(static_cast<uint8_t*>(frame) + geometry.viewOffset,
                                      geometry.width, geometry.height, geometry.pitchBytes);
-    view.SetCpuLevel(context.cpuLevel);
+    view.TakeCpuLevel(geometry.level);
     return view;
 }
 

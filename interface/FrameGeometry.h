@@ -11,12 +11,13 @@ namespace kyv {
 
 // Frames are 4 bytes a pixel. A side-by-side frame has rows of two views.
 struct FrameGeometry {
-    int32_t width;      // pixels of the view that this call treats
-    int32_t height;     // rows
-    int32_t pitchBytes; // from row to row of the frame
-    int32_t viewOffset; // bytes from a row's start to the view's first pixel
-    uint32_t layout;    // a StereoLayout; unknown values count as Mono
-    size_t frameBytes;  // the whole frame, both views
+    int32_t width;       // pixels of the view that this call treats
+    int32_t height;      // rows
+    int32_t pitchBytes;  // from row to row of the frame
+    int32_t viewOffset;  // bytes from a row's start to the view's first pixel
+    uint32_t layout;     // a StereoLayout; unknown values count as Mono
+    size_t frameBytes;   // the whole frame, both views
+    ResolvedLevel level; // of the call
 };
 
 // The largest side of a frame, in pixels. Beyond it a size is nonsense, and the arithmetic of
@@ -45,10 +46,9 @@ enum class KeptSide {
 DisplaySize GetDisplaySize(const EffectContext& context, const FrameGeometry& geometry,
                            KeptSide kept);
 
-// The view of the call in one of the host's frames, as an image of the context's level. Its bytes
+// The view of the call in one of the host's frames, as an image of the call's level. Its bytes
 // are those of the frame's format.
-KYVImageUtility::CImageARGB ViewOf(const EffectContext& context, const FrameGeometry& geometry,
-                                   void* frame);
+KYVImageUtility::CImageARGB ViewOf(const FrameGeometry& geometry, void* frame);
 
 // Copies the view of the call from one frame to another of the same geometry. The frames may be
 // one and the same, but must not overlap otherwise.

@@ -32,4 +32,15 @@ InstructionSet ProcessorInstructionSet();
 InstructionSet Resolve(int32_t cpuLevel, const ProcessorFeatures& features);
 InstructionSet Resolve(int32_t cpuLevel);
 
+// A host's level and the set that it comes to. A callback resolves its level once, with the frame's
+// geometry; from there it goes to the images, and from those to all that is made from them.
+struct ResolvedLevel {
+    int32_t level;
+    InstructionSet set;
+};
+
+inline ResolvedLevel ResolveLevel(int32_t cpuLevel) {
+    return {cpuLevel, Resolve(cpuLevel)};
+}
+
 } // namespace kyv

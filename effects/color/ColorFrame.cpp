@@ -19,8 +19,7 @@ CColorFrame::CColorFrame(const EffectContext& context, const FrameGeometry& geom
     : m_pOutput(static_cast<uint8_t*>(output) + geometry.viewOffset),
       m_pInput(static_cast<const uint8_t*>(input) + geometry.viewOffset), m_width(geometry.width),
       m_height(geometry.height), m_pitch(geometry.pitchBytes),
-      m_ayuv(context.pixelFormat == PixelFormat_Ayuv),
-      m_toArgb(kToARGB.For(Resolve(context.cpuLevel))),
-      m_toAyuv(kToAYUV.For(Resolve(context.cpuLevel))) {}
+      m_ayuv(context.pixelFormat == PixelFormat_Ayuv), m_toArgb(kToARGB.For(geometry.level.set)),
+      m_toAyuv(kToAYUV.For(geometry.level.set)) {}
 
 } // namespace kyv

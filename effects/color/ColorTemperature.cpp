@@ -135,7 +135,7 @@ KyvStatus ColorTemperature::Process(EffectContext& context, Instance& instance) 
     const CColorFrame frame(context, geometry, instance.output, input);
     const GainCurves temperatureCurves(instance.temperature);
     const GainCurves tintCurves(instance.tint);
-    const ColorTemperatureRow row = kColorTemperatureRow.For(Resolve(context.cpuLevel));
+    const ColorTemperatureRow row = kColorTemperatureRow.For(geometry.level.set);
     frame.Process(SelectField(context), comparison != 0 ? geometry.width / 2 : 0,
                   [&](uint8_t* dst, const uint8_t* src, size_t count) {
                       row(dst, src, count, temperatureCurves, tintCurves);

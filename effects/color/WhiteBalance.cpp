@@ -85,7 +85,7 @@ KyvStatus WhiteBalance::Process(EffectContext& context, Instance& instance) {
     const KneeCurves curves({instance.blue, instance.reference >> 16 & 255},
                             {instance.green, instance.reference >> 8 & 255},
                             {instance.red, instance.reference & 255});
-    const WhiteBalanceRow row = kWhiteBalanceRow.For(Resolve(context.cpuLevel));
+    const WhiteBalanceRow row = kWhiteBalanceRow.For(geometry.level.set);
     frame.Process(
         wholeFrame ? SelectField(context) : kNoRows, compare ? geometry.width / 2 : 0,
         [&](uint8_t* dst, const uint8_t* src, size_t count) { row(dst, src, count, curves); });

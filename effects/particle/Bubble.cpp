@@ -70,7 +70,7 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
     CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::AsTheyCome);
-    const CImageARGB source = ViewOf(context, geometry, instance.input);
+    const CImageARGB source = ViewOf(geometry, instance.input);
     const ParticleBounds bounds = canvas.GetBounds();
     particles.SetFrame(
         {
@@ -91,7 +91,6 @@ KyvStatus Process(EffectContext& context, BubbleInstance& instance, bool isRefra
             .source = &source,
             .body = instance.body,
             .mask = instance.mask,
-            .cpuLevel = context.cpuLevel,
         },
         GetStereoMode(geometry));
     DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);

@@ -53,7 +53,6 @@ KyvStatus Fireworks::Process(EffectContext& context, Instance& instance) {
                       .yRange = bounds.bottom},
             .bounds = bounds,
             .canvas = &canvas.GetImage(),
-            .cpuLevel = context.cpuLevel,
         },
         GetStereoMode(geometry));
     DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);

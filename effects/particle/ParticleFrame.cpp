@@ -11,6 +11,7 @@ namespace kyv {
 namespace {
 
 using KYVImageUtility::CImageARGB;
+using KYVImageUtility::ResizeMode_Bilinear;
 
 constexpr int64_t kUnitsPerMs = 10000; // host times are in 100 ns units
 
@@ -32,7 +33,7 @@ int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview) 
 }
 
 void Scale(const CImageARGB& from, CImageARGB& to) {
-    if (!from.TryResize(to, 0)) {
+    if (!from.TryResize(to, ResizeMode_Bilinear)) {
         throw std::bad_alloc();
     }
 }
@@ -83,15 +84,15 @@ CParticleCanvas::CParticleCanvas(const EffectContext& context, const FrameGeomet
     uint8_t* start = ViewStart(geometry, context.frame);
     if (m_bConverted) {
         m_ayuvView.Attach(start, geometry.width, geometry.height, geometry.pitchBytes);
-        m_ayuvView.SetCpuLevel(context.cpuLevel);
+        m_ayuvView.TakeCpuLevel(geometry.level);
         m_frame.Create(geometry.width, geometry.height);
     } else {
         m_frame.Attach(start, geometry.width, geometry.height, geometry.pitchBytes);
     }
-    m_frame.SetCpuLevel(context.cpuLevel);
+    m_frame.TakeCpuLevel(geometry.level);
     if (m_bScaled) {
         m_canvas.Create(size.width, size.height);
-        m_canvas.SetCpuLevel(context.cpuLevel);
+        m_canvas.TakeCpuLevel(geometry.level);
     }
 }
 

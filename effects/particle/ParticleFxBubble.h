@@ -29,7 +29,6 @@ public:
         const KYVImageUtility::CImageARGB* source;
         KYVImageUtility::CImageARGB* body;
         const KYVImageUtility::CImageARGB* mask; // only its alpha is used
-        int32_t cpuLevel;
     };
 
     // To be called before AdvanceTo. Another canvas size than before is another animation.
@@ -60,7 +59,6 @@ private:
     float m_fSwayFactor = 0.0F;
     bool m_bRefractive = false;
     int32_t m_nLargestSize = 0;
-    int32_t m_nCpuLevel = 0;
 };
 
 } // namespace kyv

@@ -10,6 +10,7 @@ namespace kyv {
 namespace {
 
 using KYVImageUtility::CImageARGB;
+using KYVImageUtility::ResizeMode_Bilinear;
 
 // How much wider than the bubble the area is that a lens shows, and how far that area begins left
 // of and above the bubble. The second is three steps of single precision above the nearest value to
@@ -54,13 +55,12 @@ void CParticleFxBubble::SetFrame(const FrameSetup& setup, StereoMode mode) {
     m_bRefractive = setup.isRefractive;
     m_nDisplayWidth = setup.displayWidth;
     m_nDisplayHeight = setup.displayHeight;
-    m_nCpuLevel = setup.cpuLevel;
 
     if (!m_scratch.GetBuffer()) {
         m_scratch.Create(setup.body->GetWidth(), setup.body->GetHeight());
         m_scratch.FillBytes(0);
     }
-    m_scratch.SetCpuLevel(m_nCpuLevel);
+    m_scratch.TakeCpuLevel(*m_pCanvas);
     m_pictureLayer.SetSprite(m_scratch);
     m_pictureLayer.BindTarget(*m_pCanvas, m_nDisplayWidth, m_nDisplayHeight, mode);
     m_bodyLayer.SetSprite(*setup.body);
@@ -68,7 +68,6 @@ void CParticleFxBubble::SetFrame(const FrameSetup& setup, StereoMode mode) {
     for (StereoSpriteLayer* layer : {&m_pictureLayer, &m_bodyLayer}) {
         layer->SetAnchor(StereoSpriteLayer::Anchor::TopLeft);
         layer->SetBlend(StereoSpriteLayer::Blend::Alpha);
-        layer->SetCpuLevel(m_nCpuLevel);
     }
 }
 
@@ -88,7 +87,7 @@ void CParticleFxBubble::RenderParticles() {
 
 void CParticleFxBubble::RenderMiniatures() {
     // A scene too small to be scaled leaves the bubbles empty.
-    if (!m_pSource->TryResize(m_scratch, 0)) {
+    if (!m_pSource->TryResize(m_scratch, ResizeMode_Bilinear)) {
         m_scratch.FillBytes(0);
     } else {
         m_scratch.CopyAlphaFrom(*m_pMask);
@@ -134,9 +133,9 @@ bool CParticleFxBubble::RefractInto(CImageARGB& scratch, const ParticleRecord& b
                        TruncateToInt(kLensSize * h)};
     CImageARGB behind;
     TakePart(behind, *m_pCanvas, lens);
-    behind.SetCpuLevel(m_nCpuLevel);
+    behind.TakeCpuLevel(*m_pCanvas);
     if (behind.GetWidth() == lens.w && behind.GetHeight() == lens.h) {
-        return behind.TryResize(scratch, 0);
+        return behind.TryResize(scratch, ResizeMode_Bilinear);
     }
 
     CImageARGB visible;
@@ -147,7 +146,7 @@ bool CParticleFxBubble::RefractInto(CImageARGB& scratch, const ParticleRecord& b
               VisibleStart(box.y, scratch.GetHeight(), h),
               VisibleLength(visible.GetWidth(), scratch.GetWidth(), w),
               VisibleLength(visible.GetHeight(), scratch.GetHeight(), h)});
-    return behind.TryResize(part, 0);
+    return behind.TryResize(part, ResizeMode_Bilinear);
 }
 
 } // namespace kyv

@@ -197,7 +197,6 @@ void CParticleFxFireworks::SetFrame(const FrameSetup& setup, StereoMode mode) {
     m_fDragFactor = ((1.0F - setup.size) * 0.6F + 0.25F) / setup.scale;
     m_emitter.spawn = setup.spawn;
     m_emitter.bounds = setup.bounds;
-    m_nCpuLevel = setup.cpuLevel;
     m_pCanvas = setup.canvas;
     m_mode = mode;
     if (mode != StereoMode::Mono) {

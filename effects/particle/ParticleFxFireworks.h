@@ -47,7 +47,6 @@ public:
         ParticleBounds bounds;
         // B, G, R, A; stays the caller's and is used until the picture is drawn.
         KYVImageUtility::CImageARGB* canvas;
-        int32_t cpuLevel;
     };
 
     CParticleFxFireworks() = default;
@@ -71,7 +70,6 @@ private:
     EmitterSpec m_emitter = {};
     float m_fScale = 1.0F;
     float m_fDragFactor = 0.0F;
-    int32_t m_nCpuLevel = 0;
     StereoMode m_mode = StereoMode::Mono;
     CStereoLibrary m_stereo;
     KYVImageUtility::CImageARGB* m_pCanvas = nullptr;

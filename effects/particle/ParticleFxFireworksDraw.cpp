@@ -24,7 +24,7 @@ CImageARGB& CParticleFxFireworks::GlowOfSize(int32_t size) {
     if (!glow.GetBuffer()) {
         DrawGlow(glow, size);
     }
-    glow.SetCpuLevel(m_nCpuLevel);
+    glow.TakeCpuLevel(*m_pCanvas);
     return glow;
 }
 
@@ -51,7 +51,8 @@ void CParticleFxFireworks::DrawSpark(const Spark& spark, float shift) {
     glow.FillColor(spark.red, spark.green, spark.blue);
     if (size > kLargestGlow) {
         const auto length = static_cast<float>(size);
-        m_pCanvas->DrawSprite(glow, 1, left, top, length, length, opacity);
+        m_pCanvas->DrawSprite(glow, KYVImageUtility::SpriteMode_AddBlend, left, top, length, length,
+                              opacity);
         return;
     }
     const int32_t x = TruncateToInt(left);
@@ -62,7 +63,7 @@ void CParticleFxFireworks::DrawSpark(const Spark& spark, float shift) {
     }
     CImageARGB part;
     glow.GetSubImage(part, std::max(-x, 0), std::max(-y, 0), view.GetWidth(), view.GetHeight());
-    view.SetCpuLevel(m_nCpuLevel);
+    view.TakeCpuLevel(*m_pCanvas);
     view.AddBlend(part, opacity);
 }
 

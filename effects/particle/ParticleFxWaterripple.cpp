@@ -28,12 +28,11 @@ void CParticleFxWaterripple::SetFrame(const FrameSetup& setup) {
     }
     if (!m_sheen.GetBuffer()) {
         m_sheen.Create(m_nWidth, m_nHeight);
-        if (!setup.sheen->TryResize(m_sheen, 0)) {
+        if (!setup.sheen->TryResize(m_sheen, KYVImageUtility::ResizeMode_Bilinear)) {
             m_sheen.FillBytes(0);
         }
     }
     m_fScale = setup.scale;
-    m_nCpuLevel = setup.cpuLevel;
 }
 
 void CParticleFxWaterripple::SpawnParticle(int32_t timeMs) {

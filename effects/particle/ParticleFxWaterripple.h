@@ -27,7 +27,6 @@ public:
         const KYVImageUtility::CImageARGB* sheen;
         float scale;   // canvas width / 720
         float density; // 0..1
-        int32_t cpuLevel;
     };
 
     // To be called before AdvanceTo. Another canvas size than before is another animation; the
@@ -45,7 +44,6 @@ private:
     int32_t m_nWidth = 0;                // of the canvas
     int32_t m_nHeight = 0;
     float m_fScale = 1.0F;
-    int32_t m_nCpuLevel = 0;
 };
 
 } // namespace kyv

@@ -27,10 +27,10 @@ constexpr int32_t kFarthest = 32767;
 class CRippleBender {
 public:
     // The picture has one more column and row than width and height say, all of them written.
-    CRippleBender(CImageARGB& picture, int32_t width, int32_t height, int32_t cpuLevel)
+    CRippleBender(CImageARGB& picture, int32_t width, int32_t height)
         : m_picture(picture), m_nWidth(width), m_nHeight(height),
-          m_offsetRow(kRippleOffsetRow.For(Resolve(cpuLevel))),
-          m_sampleRow(kRippleSampleRow.For(Resolve(cpuLevel))) {}
+          m_offsetRow(kRippleOffsetRow.For(picture.GetInstructionSet())),
+          m_sampleRow(kRippleSampleRow.For(picture.GetInstructionSet())) {}
 
     void Bend(const Ripple& ripple);
 
@@ -146,12 +146,13 @@ void CParticleFxWaterripple::RenderParticles() {
     }
     CImageARGB water;
     picture.GetSubImage(water, 0, 0, width, height);
-    water.SetCpuLevel(m_nCpuLevel);
+    water.TakeCpuLevel(*m_pCanvas);
     water.CopyFrom(canvas);
     water.AddBlend(sheen, 255);
     water.SetAlpha(255);
 
-    CRippleBender bender(picture, width, height, m_nCpuLevel);
+    picture.TakeCpuLevel(*m_pCanvas);
+    CRippleBender bender(picture, width, height);
     for (const Ripple& ripple : m_particles) {
         bender.Bend(ripple);
     }
@@ -162,7 +163,7 @@ void CParticleFxWaterripple::RenderParticles() {
         canvas.CopyFrom(water);
         return;
     }
-    canvas.SetCpuLevel(m_nCpuLevel);
+    canvas.TakeCpuLevel(*m_pCanvas);
     canvas.AlphaBlend(water, fade);
 }
 

@@ -57,7 +57,6 @@ void StereoSpriteLayer::DrawParticle(const ParticleRecord& particle) {
     default:
         return;
     }
-    m_pSprite->SetCpuLevel(m_nCpuLevel);
     m_pTarget->DrawSprite(*m_pSprite, static_cast<int32_t>(m_blend), x, y, w, h,
                           static_cast<uint8_t>(m_nAlpha * particle.alpha >> 8));
 }

@@ -12,7 +12,10 @@ namespace kyv {
 class StereoSpriteLayer {
 public:
     enum class Anchor : int32_t { Centre = 0, TopLeft = 1 };
-    enum class Blend : int32_t { Alpha = 0, Additive = 1 };
+    enum class Blend : int32_t {
+        Alpha = KYVImageUtility::SpriteMode_AlphaBlend,
+        Additive = KYVImageUtility::SpriteMode_AddBlend,
+    };
 
     StereoSpriteLayer() = default;
     // With another stereo helper than the usual one.
@@ -28,7 +31,6 @@ public:
     void SetScale(float x, float y);
     void SetAnchor(Anchor anchor) { m_anchor = anchor; }
     void SetBlend(Blend blend) { m_blend = blend; }
-    void SetCpuLevel(int32_t level) { m_nCpuLevel = level; }
 
     // Draws nothing in a mode that is none of mono, left and right view.
     void DrawParticle(const ParticleRecord& particle);
@@ -50,7 +52,6 @@ private:
     float m_fPixelAspect = 1.0F;
     StereoMode m_mode = StereoMode::Mono;
     CStereoLibrary m_stereo;
-    int32_t m_nCpuLevel = 0;
 };
 
 } // namespace kyv

@@ -45,13 +45,12 @@ KyvStatus WaterRipple::Process(EffectContext& context, Instance& instance) {
     }
     const CanvasSize size = ChooseCanvasSize(context, geometry, CanvasRule::KeepShorterSide);
     CParticleCanvas canvas(context, geometry, size, CParticleCanvas::Pixels::Argb);
-    instance.sheen->SetCpuLevel(context.cpuLevel);
+    instance.sheen->TakeCpuLevel(geometry.level);
     particles.SetFrame({
         .canvas = &canvas.GetImage(),
         .sheen = instance.sheen,
         .scale = canvas.GetScale(),
         .density = instance.params[Density],
-        .cpuLevel = context.cpuLevel,
     });
     DrawAnimation(context, geometry, kPreview, instance.input, canvas, particles);
     return KYV_OK;

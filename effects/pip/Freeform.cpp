@@ -235,7 +235,7 @@ private:
             recipe.direction = settings.direction;
             recipe.blur = blur(settings);
             layer.Begin(recipe, m_work.borderSpans, m_work.coverage,
-                        Resolve(foreground.GetCpuLevel()));
+                        foreground.GetInstructionSet());
         };
         if (m_settings.border.enabled) {
             recipe.cutsPicture = true;
@@ -313,8 +313,8 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     if (!instance.background || !context.frame || !GetFrameGeometry(context, geometry)) {
         return KYV_FAIL;
     }
-    const CImageARGB output = ViewOf(context, geometry, context.frame);
-    const CImageARGB background = ViewOf(context, geometry, instance.background);
+    const CImageARGB output = ViewOf(geometry, context.frame);
+    const CImageARGB background = ViewOf(geometry, instance.background);
     const bool ayuv = context.pixelFormat == PixelFormat_Ayuv;
     const Settings settings = ReadSettings(context, geometry, ayuv);
     if (!instance.foreground || !settings.DrawsAnything()) {
@@ -325,8 +325,7 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     }
     Prepare(instance);
     CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
-    work.Render(context.fieldSelector, ViewOf(context, geometry, instance.foreground), background,
-                output);
+    work.Render(context.fieldSelector, ViewOf(geometry, instance.foreground), background, output);
     return KYV_OK;
 }
 

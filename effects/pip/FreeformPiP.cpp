@@ -98,7 +98,7 @@ void CFreeformPiP::SetFilterIndex(int32_t index) {
 
 // False without a size or when the source, unless it is null for none, has no pixels or another
 // size.
-bool CFreeformPiP::Prepare(const CImageARGB* source, int32_t cpuLevel) {
+bool CFreeformPiP::Prepare(const CImageARGB* source, InstructionSet set) {
     if (!m_bSizeSet || (source && (!source->GetBuffer() || source->GetWidth() != m_nSourceWidth ||
                                    source->GetHeight() != m_nSourceHeight))) {
         return false;
@@ -108,8 +108,8 @@ bool CFreeformPiP::Prepare(const CImageARGB* source, int32_t cpuLevel) {
     if (source) {
         m_picture = {source->GetBuffer(), source->GetPitch(), m_nSourceWidth, m_nSourceHeight};
     }
-    m_pMapRow = kQuadMapRow.For(Resolve(cpuLevel));
-    m_pSampleRow = kQuadSampleRow.For(Resolve(cpuLevel));
+    m_pMapRow = kQuadMapRow.For(set);
+    m_pSampleRow = kQuadSampleRow.For(set);
     if (m_bDirty) {
         Allocate();
         RasterPointF quad[4], corners[4];
@@ -127,7 +127,7 @@ bool CFreeformPiP::Prepare(const CImageARGB* source, int32_t cpuLevel) {
 }
 
 bool CFreeformPiP::BeginRows(const CImageARGB& source) {
-    return Prepare(&source, source.GetCpuLevel());
+    return Prepare(&source, source.GetInstructionSet());
 }
 
 void CFreeformPiP::DrawRow(int32_t y, uint8_t* row) {
@@ -141,14 +141,14 @@ void CFreeformPiP::DrawRow(int32_t y, uint8_t* row) {
 }
 
 int32_t CFreeformPiP::Render(const CImageARGB& source, CImageARGB& destination) {
-    return Prepare(&source, source.GetCpuLevel()) ? DrawOn(destination) : 0;
+    return Prepare(&source, source.GetInstructionSet()) ? DrawOn(destination) : 0;
 }
 
 int32_t CFreeformPiP::RenderCheckerboard(CImageARGB& destination) {
     if (m_nMapMode != MapMode_Nearest && m_nMapMode != MapMode_Bilinear) {
         return 0;
     }
-    return Prepare(nullptr, destination.GetCpuLevel()) ? DrawOn(destination) : 0;
+    return Prepare(nullptr, destination.GetInstructionSet()) ? DrawOn(destination) : 0;
 }
 
 // The callback stays installed after a drawing, and pixels that somebody else emits then find

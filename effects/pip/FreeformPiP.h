@@ -101,7 +101,7 @@ private:
     enum class Renderer { Picture, Checkerboard };
 
     int32_t DrawOn(KYVImageUtility::CImageARGB& destination);
-    bool Prepare(const KYVImageUtility::CImageARGB* source, int32_t cpuLevel);
+    bool Prepare(const KYVImageUtility::CImageARGB* source, InstructionSet set);
     void Allocate();
     void BuildSpan(int32_t x, int32_t y, size_t count);
     void BuildFiltered(int32_t x, int32_t y, size_t count);

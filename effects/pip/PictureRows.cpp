@@ -25,7 +25,7 @@ void CPictureRows::Begin(CFreeformPiP& pip, const CImageARGB& foreground,
     m_settings = settings;
     m_nWidth = foreground.GetWidth();
     m_nHeight = foreground.GetHeight();
-    m_set = Resolve(foreground.GetCpuLevel());
+    m_set = foreground.GetInstructionSet();
     const PixelBox frame = {0, 0, m_nWidth, m_nHeight};
     const PixelBox drawn =
         pip.BeginRows(foreground) ? pip.Spans().Bounds().CutTo(settings.box) : PixelBox{};

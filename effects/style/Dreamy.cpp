@@ -31,8 +31,7 @@ KyvStatus Dreamy::Process(EffectContext& context, Instance& instance) {
     if (!instance.filter) {
         instance.filter = new CDreamyFilter;
     }
-    instance.filter->Render(MakeStyleFrame(context, geometry, instance.input), degree, mask,
-                            context.cpuLevel);
+    instance.filter->Render(MakeStyleFrame(context, geometry, instance.input), degree, mask);
     return KYV_OK;
 }
 

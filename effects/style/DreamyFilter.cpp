@@ -26,7 +26,7 @@ float GlowSigma(float degree) {
 } // namespace
 
 void CDreamyFilter::Gather(const StyleFrame& frame) {
-    const HighlightRow highlight = kHighlightRow.For(frame.set);
+    const HighlightRow highlight = kHighlightRow.For(frame.level.set);
     for (int32_t y = 0; y < frame.height; ++y) {
         const uint8_t* row = frame.Load(y, m_source.data());
         m_soft.TakeRow(y, row, m_softRows);
@@ -35,8 +35,7 @@ void CDreamyFilter::Gather(const StyleFrame& frame) {
     }
 }
 
-void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskShape& mask,
-                           int32_t cpuLevel) {
+void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskShape& mask) {
     m_mask.Update(mask, frame.width, frame.height);
     if (m_mask.IsNothing()) {
         frame.Copy();
@@ -49,9 +48,9 @@ void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskS
     m_source.resize(static_cast<size_t>(frame.width) * 4);
     m_result.resize(static_cast<size_t>(frame.width) * 4);
     m_soft.Prepare(frame.width, frame.height, ChooseShrinkBits(frame.width, softSigma, 960),
-                   cpuLevel);
+                   frame.level);
     m_glow.Prepare(frame.width, frame.height, ChooseShrinkBits(frame.width, glowSigma, 480),
-                   cpuLevel);
+                   frame.level);
     m_soft.PrepareRows(m_softRows);
     m_glow.PrepareRows(m_glowRows);
     Gather(frame);
@@ -63,7 +62,7 @@ void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskS
         .glow = static_cast<uint16_t>(44 + degree * 3),
         .depth = static_cast<uint16_t>(8 + degree * 5 / 4),
     };
-    const DreamyRow dreamy = kDreamyRow.For(frame.set);
+    const DreamyRow dreamy = kDreamyRow.For(frame.level.set);
     const auto width = static_cast<size_t>(frame.width);
     for (int32_t y = frame.firstRow; y < frame.height; y += frame.rowStep) {
         const uint8_t* source = frame.Load(y, m_source.data());
@@ -74,7 +73,7 @@ void CDreamyFilter::Render(const StyleFrame& frame, uint32_t degree, const MaskS
         } else {
             dreamy(m_result.data(), source, m_soft.Row(y, m_softRows), m_glow.Row(y, m_glowRows),
                    width, mix);
-            kMaskMixRow.For(frame.set)(target, source, m_result.data(), m_mask.Row(y), width);
+            kMaskMixRow.For(frame.level.set)(target, source, m_result.data(), m_mask.Row(y), width);
         }
         frame.Store(y, target);
     }

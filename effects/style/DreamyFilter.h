@@ -19,7 +19,7 @@ namespace kyv {
 class CDreamyFilter {
 public:
     // degree 1..40; the mask a normalised one. Throws std::bad_alloc, with nothing written.
-    void Render(const StyleFrame& frame, uint32_t degree, const MaskShape& mask, int32_t cpuLevel);
+    void Render(const StyleFrame& frame, uint32_t degree, const MaskShape& mask);
 
 private:
     void Gather(const StyleFrame& frame);

@@ -42,7 +42,7 @@ KyvStatus LightRay::Process(EffectContext& context, Instance& instance) {
         instance.filter = new CLightRayFilter;
     }
     instance.filter->Render(MakeStyleFrame(context, geometry, instance.input), settings.degree,
-                            settings.x, settings.y, context.threadCount, context.cpuLevel);
+                            settings.x, settings.y, context.threadCount);
     return KYV_OK;
 }
 

@@ -112,11 +112,10 @@ void CLightRayFilter::InBands(int32_t rows, Work&& work) {
         &job);
 }
 
-void CLightRayFilter::Prepare(const StyleFrame& frame, float x, float y, uint32_t bands,
-                              int32_t cpuLevel) {
-    m_set = frame.set;
+void CLightRayFilter::Prepare(const StyleFrame& frame, float x, float y, uint32_t bands) {
+    m_set = frame.level.set;
     m_small.Prepare(frame.width, frame.height, ChooseShrinkBits(frame.width, 0.0F, kWidestSmall),
-                    cpuLevel);
+                    frame.level);
     const int32_t width = m_small.GetImage().GetWidth();
     const int32_t height = m_small.GetImage().GetHeight();
     const size_t pixels = static_cast<size_t>(width) * height;
@@ -242,13 +241,13 @@ void CLightRayFilter::Compose(const StyleFrame& frame, int32_t first, int32_t en
 }
 
 void CLightRayFilter::Render(const StyleFrame& frame, uint32_t degree, float x, float y,
-                             uint32_t threads, int32_t cpuLevel) {
+                             uint32_t threads) {
     if (degree == 0) {
         frame.Copy();
         return;
     }
     const uint32_t bands = std::clamp(threads, 1U, kMostBands);
-    Prepare(frame, x, y, bands, cpuLevel);
+    Prepare(frame, x, y, bands);
     const int32_t width = m_small.GetImage().GetWidth();
     const int32_t height = m_small.GetImage().GetHeight();
     InBands(height,

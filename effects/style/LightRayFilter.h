@@ -23,8 +23,7 @@ class CLightRayFilter {
 public:
     // degree 0..30; the light's place in fractions of the frame, numbers within 16 frames of it.
     // Throws std::bad_alloc, with nothing written.
-    void Render(const StyleFrame& frame, uint32_t degree, float x, float y, uint32_t threads,
-                int32_t cpuLevel);
+    void Render(const StyleFrame& frame, uint32_t degree, float x, float y, uint32_t threads);
 
 private:
     // What one band of rows works with.
@@ -35,7 +34,7 @@ private:
         std::vector<uint16_t> between;
     };
 
-    void Prepare(const StyleFrame& frame, float x, float y, uint32_t bands, int32_t cpuLevel);
+    void Prepare(const StyleFrame& frame, float x, float y, uint32_t bands);
     void FillShadows(int32_t first, int32_t end);
     void PrepareStep(float zoom);
 

@@ -29,7 +29,7 @@ constexpr PencilTone kTone = {
 } // namespace
 
 void CPencilFilter::Prepare(const StyleFrame& frame) {
-    m_set = frame.set;
+    m_set = frame.level.set;
     m_width = frame.width;
     m_height = frame.height;
     const size_t pixels = static_cast<size_t>(m_width) * m_height;

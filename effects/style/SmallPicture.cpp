@@ -46,8 +46,7 @@ int32_t ChooseShrinkBits(int32_t width, float sigma, int32_t widest) {
 }
 
 void CSmallPicture::Prepare(int32_t frameWidth, int32_t frameHeight, int32_t bits,
-                            int32_t cpuLevel) {
-    m_set = Resolve(cpuLevel);
+                            const ResolvedLevel& level) {
     if (frameWidth != m_frameWidth || frameHeight != m_frameHeight || bits != m_bits) {
         m_bits = -1; // should an allocation fail
         const int32_t width = Shrunk(frameWidth, bits);
@@ -66,8 +65,8 @@ void CSmallPicture::Prepare(int32_t frameWidth, int32_t frameHeight, int32_t bit
         m_frameHeight = frameHeight;
         m_bits = bits;
     }
-    m_image.SetCpuLevel(cpuLevel);
-    m_other.SetCpuLevel(cpuLevel);
+    m_image.TakeCpuLevel(level);
+    m_other.TakeCpuLevel(level);
 }
 
 void CSmallPicture::PrepareRows(SmallPictureRows& rows) const {
@@ -86,14 +85,15 @@ void CSmallPicture::TakeRow(int32_t y, const uint8_t* row, SmallPictureRows& row
         if ((y & (side - 1)) == 0) {
             std::fill(rows.sums.begin(), rows.sums.end(), uint16_t{0});
         }
-        kAddRow.For(m_set)(rows.sums.data(), row, bytes);
+        kAddRow.For(m_image.GetInstructionSet())(rows.sums.data(), row, bytes);
         if (((y + 1) & (side - 1)) == 0) {
             uint16_t* edge = rows.sums.data() + bytes;
             for (uint16_t* pixel = edge; pixel < rows.sums.data() + rows.sums.size(); pixel += 4) {
                 std::memcpy(pixel, edge - 4, 4 * sizeof *pixel);
             }
-            kAverageRow.For(m_set)(m_image.Row(y >> m_bits), rows.sums.data(),
-                                   static_cast<size_t>(m_image.GetWidth()), m_bits);
+            kAverageRow.For(m_image.GetInstructionSet())(m_image.Row(y >> m_bits), rows.sums.data(),
+                                                         static_cast<size_t>(m_image.GetWidth()),
+                                                         m_bits);
         }
     }
 }
@@ -126,11 +126,12 @@ const uint8_t* CSmallPicture::Row(int32_t y, SmallPictureRows& rows) const {
     }
     const Place place(y, m_bits, m_image.GetHeight());
     const auto width = static_cast<size_t>(m_image.GetWidth());
-    kLerp.For(m_set)(rows.between.data(), m_image.Row(place.lower), m_image.Row(place.lower + 1),
-                     width, static_cast<uint32_t>(place.fraction));
-    kBilinear.For(m_set)(rows.enlarged.data(), rows.between.data(),
-                         static_cast<size_t>(m_frameWidth),
-                         {.left = m_left.data(), .weights = m_weights.data()});
+    kLerp.For(m_image.GetInstructionSet())(rows.between.data(), m_image.Row(place.lower),
+                                           m_image.Row(place.lower + 1), width,
+                                           static_cast<uint32_t>(place.fraction));
+    kBilinear.For(m_image.GetInstructionSet())(
+        rows.enlarged.data(), rows.between.data(), static_cast<size_t>(m_frameWidth),
+        {.left = m_left.data(), .weights = m_weights.data()});
     return rows.enlarged.data();
 }
 

@@ -26,7 +26,7 @@ class CSmallPicture {
 public:
     // Prepares for frames of a size and squares of 1 << bits pixels, 0 <= bits <= kMostShrinkBits.
     // Buffers are kept as long as nothing changes. Throws std::bad_alloc.
-    void Prepare(int32_t frameWidth, int32_t frameHeight, int32_t bits, int32_t cpuLevel);
+    void Prepare(int32_t frameWidth, int32_t frameHeight, int32_t bits, const ResolvedLevel& level);
 
     void PrepareRows(SmallPictureRows& rows) const;
 
@@ -49,7 +49,6 @@ private:
     KYVImageUtility::CImageARGB m_image;
     KYVImageUtility::CImageARGB m_other; // the blur goes back and forth
     CBoxBlurRows m_window;
-    InstructionSet m_set = InstructionSet::Scalar;
     int32_t m_frameWidth = 0;
     int32_t m_frameHeight = 0;
     int32_t m_bits = -1;

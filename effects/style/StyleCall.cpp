@@ -16,7 +16,7 @@ StyleFrame MakeStyleFrame(const EffectContext& context, const FrameGeometry& geo
         .ayuv = context.pixelFormat == PixelFormat_Ayuv,
         .firstRow = context.fieldSelector == FieldSelector_Second ? 1 : 0,
         .rowStep = field ? 2 : 1,
-        .set = Resolve(context.cpuLevel),
+        .level = geometry.level,
     };
 }
 

@@ -13,13 +13,13 @@ const uint8_t* StyleFrame::Load(int32_t y, uint8_t* block) const {
     if (!ayuv) {
         return row;
     }
-    kToARGB.For(set)(block, row, static_cast<size_t>(width));
+    kToARGB.For(level.set)(block, row, static_cast<size_t>(width));
     return block;
 }
 
 void StyleFrame::Store(int32_t y, const uint8_t* row) const {
     if (ayuv) {
-        kToAYUV.For(set)(output + y * pitchBytes, row, static_cast<size_t>(width));
+        kToAYUV.For(level.set)(output + y * pitchBytes, row, static_cast<size_t>(width));
     }
 }
 

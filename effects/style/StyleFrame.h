@@ -19,7 +19,7 @@ struct StyleFrame {
     bool ayuv;
     int32_t firstRow; // the rows that are written: firstRow, firstRow + rowStep, ...
     int32_t rowStep;
-    InstructionSet set;
+    ResolvedLevel level;
 
     // The row in the input, or its conversion in the block, which holds width pixels.
     const uint8_t* Load(int32_t y, uint8_t* block) const;

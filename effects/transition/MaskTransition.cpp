@@ -18,9 +18,9 @@ namespace {
 
 using KYVImageUtility::CImageARGB;
 using KYVImageUtility::CImageByte;
+using KYVImageUtility::ResizeMode_Bilinear;
 
 constexpr int32_t kRed = 2;
-constexpr int32_t kBilinear = 0;
 constexpr int32_t kLeastScalable = 2; // pixels each way
 
 MaskBlendParams ReadParams(const EffectContext& context) {
@@ -89,7 +89,6 @@ bool CMaskTransition::LoadMask(const EffectContext& context, uint16_t bitmapId) 
         return false;
     }
     CImageARGB bitmap;
-    bitmap.SetCpuLevel(context.cpuLevel);
     LoadBitmapResource(bitmap, context.descriptor->module->ModuleHandle, bitmapId);
     if (!bitmap.GetBuffer()) {
         return false;
@@ -98,11 +97,12 @@ bool CMaskTransition::LoadMask(const EffectContext& context, uint16_t bitmapId) 
     if (!GetFrameGeometry(context, geometry)) {
         return true;
     }
+    bitmap.TakeCpuLevel(geometry.level);
     const DisplaySize display = GetDisplaySize(context, geometry, KeptSide::Height);
     // A frame of one column or row uses the first of two.
     CImageARGB fitted(std::max(display.width, kLeastScalable),
                       std::max(geometry.height, kLeastScalable));
-    if (!fitted.GetBuffer() || !bitmap.TryResize(fitted, kBilinear)) {
+    if (!fitted.GetBuffer() || !bitmap.TryResize(fitted, ResizeMode_Bilinear)) {
         throw std::bad_alloc();
     }
     // A quarter of the memory to read for every frame.
@@ -123,17 +123,16 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
         }
         return;
     }
-    CImageARGB target = ViewOf(context, geometry, output);
-    const CImageARGB pictures[2] = {ViewOf(context, geometry, inputs[0]),
-                                    ViewOf(context, geometry, inputs[1])};
+    CImageARGB target = ViewOf(geometry, output);
+    const CImageARGB pictures[2] = {ViewOf(geometry, inputs[0]), ViewOf(geometry, inputs[1])};
     const bool inBands = pool && context.threadCount >= 2;
     const DisplaySize display = GetDisplaySize(context, geometry, KeptSide::Height);
     const bool isScaled = !inBands && display.differs && geometry.width >= kLeastScalable &&
                           geometry.height >= kLeastScalable;
     for (int i = 0; isScaled && i < 2; ++i) {
         EnsureSize(m_scaled[i], display.width, geometry.height);
-        m_scaled[i].SetCpuLevel(context.cpuLevel);
-        if (!pictures[i].TryResize(m_scaled[i], kBilinear)) {
+        m_scaled[i].TakeCpuLevel(geometry.level);
+        if (!pictures[i].TryResize(m_scaled[i], ResizeMode_Bilinear)) {
             throw std::bad_alloc();
         }
     }
@@ -142,7 +141,7 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
         .picture0 = isScaled ? m_scaled[0] : pictures[0],
         .picture1 = isScaled ? m_scaled[1] : pictures[1],
         .mask = m_mask,
-        .row = kMaskBlendRow.For(Resolve(context.cpuLevel)),
+        .row = kMaskBlendRow.For(geometry.level.set),
         .blend = {},
     };
     BuildMaskBlend(job.blend, ReadParams(context));
@@ -151,7 +150,7 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
         return;
     }
     job.BlendRows(0, geometry.height);
-    if (isScaled && !m_scaled[0].TryResize(target, kBilinear)) {
+    if (isScaled && !m_scaled[0].TryResize(target, ResizeMode_Bilinear)) {
         throw std::bad_alloc();
     }
 }

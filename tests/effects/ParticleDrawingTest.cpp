@@ -104,11 +104,12 @@ TEST(RippleDrawing, BendsLikeTheSlowFormAtEveryLevel) {
 
             Frame output = input;
             CImageARGB canvas = Wrap(output, c.width);
+            canvas.SetCpuLevel(level);
             CImageARGB noSheen; // stays clear: adds nothing
             noSheen.Create(2, 2);
             noSheen.FillBytes(0);
             CRippleProbe probe;
-            probe.SetFrame({&canvas, &noSheen, 1.0F, 0.5F, level});
+            probe.SetFrame({&canvas, &noSheen, 1.0F, 0.5F});
             probe.Take(c.ripples);
             probe.RenderParticles();
             ASSERT_EQ(output, expected) << c.width << "x" << c.height << " level " << level;
@@ -126,7 +127,7 @@ TEST(RippleDrawing, AddsTheSheenFadesItAndKeepsItsFirstSize) {
     CImageARGB sheen(4, 4);
     sheen.FillBytes(64); // 64 of each colour at alpha 64: (64 * 64) >> 8 = 16 more
     CRippleProbe probe;
-    probe.SetFrame({&canvas, &sheen, 1.0F, 0.0F, 0});
+    probe.SetFrame({&canvas, &sheen, 1.0F, 0.0F});
     probe.SetDuration(1000);
     probe.AdvanceTo(500);
     probe.Take({});
@@ -144,7 +145,7 @@ TEST(RippleDrawing, AddsTheSheenFadesItAndKeepsItsFirstSize) {
     Frame largeInput(10 * 12, 0x20102030);
     Frame largeOutput = largeInput;
     CImageARGB largeCanvas = Wrap(largeOutput, 10);
-    probe.SetFrame({&largeCanvas, &sheen, 1.0F, 0.0F, 0});
+    probe.SetFrame({&largeCanvas, &sheen, 1.0F, 0.0F});
     probe.AdvanceTo(500);
     probe.Take({});
     probe.RenderIfVisible();
@@ -351,8 +352,9 @@ TEST(FireworksDrawing, AddsACentredGlowOfTheSparksColour) {
         for (const int size : {8, 9, 300}) {
             Frame frame(400 * 320, 0xFF101010);
             CImageARGB canvas = Wrap(frame, 400);
+            canvas.SetCpuLevel(level);
             CFireworksProbe probe;
-            probe.SetFrame({0.5F, 0.5F, 1.0F, {}, {0.0F, 0.0F, 400.0F, 320.0F}, &canvas, level},
+            probe.SetFrame({0.5F, 0.5F, 1.0F, {}, {0.0F, 0.0F, 400.0F, 320.0F}, &canvas},
                            StereoMode::Mono);
             Spark spark = {};
             spark.x = 200.5F;
@@ -379,7 +381,8 @@ TEST(FireworksDrawing, AddsACentredGlowOfTheSparksColour) {
             // Half outside it is cut, not moved.
             Frame edge(400 * 320, 0xFF101010);
             CImageARGB edgeCanvas = Wrap(edge, 400);
-            probe.SetFrame({0.5F, 0.5F, 1.0F, {}, {0.0F, 0.0F, 400.0F, 320.0F}, &edgeCanvas, level},
+            edgeCanvas.SetCpuLevel(level);
+            probe.SetFrame({0.5F, 0.5F, 1.0F, {}, {0.0F, 0.0F, 400.0F, 320.0F}, &edgeCanvas},
                            StereoMode::Mono);
             spark.x = 0.5F;
             probe.Take({spark});

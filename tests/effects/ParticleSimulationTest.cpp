@@ -173,7 +173,6 @@ struct BubbleRig {
         setup.source = &canvas;
         setup.body = &picture;
         setup.mask = &picture;
-        setup.cpuLevel = 0;
     }
 
     void GoTo(int32_t timeMs) {
@@ -305,8 +304,7 @@ struct FireworksRig {
     FireworksRig(int32_t width, int32_t height, float size, float density) : canvas(width, height) {
         const auto w = static_cast<float>(width);
         const auto h = static_cast<float>(height);
-        setup = {size,    density, w / 720.0F, {0.0F, 0.0F, 0.0F, w, h}, {0.0F, 0.0F, w, h},
-                 &canvas, 0};
+        setup = {size, density, w / 720.0F, {0.0F, 0.0F, 0.0F, w, h}, {0.0F, 0.0F, w, h}, &canvas};
         particles.SetFrame(setup, StereoMode::Mono);
     }
 
@@ -318,7 +316,7 @@ struct FireworksRig {
 struct RippleRig {
     RippleRig(int32_t width, int32_t height, float density) : canvas(width, height), sheen(4, 4) {
         sheen.FillBytes(0);
-        particles.SetFrame({&canvas, &sheen, static_cast<float>(width) / 720.0F, density, 0});
+        particles.SetFrame({&canvas, &sheen, static_cast<float>(width) / 720.0F, density});
     }
 
     CImageARGB canvas;
