@@ -114,6 +114,27 @@ bool ReadPalette(ByteView bytes, size_t offset, uint32_t count, size_t entryByte
     return true;
 }
 
+// The masks of the header, or those that the bits stand for; end moves behind what was read.
+bool ReadMasks(ByteView bytes, uint32_t headerBytes, size_t& end, Dib& dib) {
+    if (dib.packing != Packing::BitFields && dib.packing != Packing::AlphaBitFields) {
+        constexpr uint32_t kOf16[] = {0x7C00, 0x03E0, 0x001F};
+        constexpr uint32_t kOfOthers[] = {0xFF0000, 0x00FF00, 0x0000FF};
+        std::copy_n(dib.bits == 16 ? kOf16 : kOfOthers, 3, dib.masks);
+        return true;
+    }
+    // Behind the oldest header, inside the newer ones.
+    const size_t count = dib.packing == Packing::AlphaBitFields || headerBytes >= 56 ? 4 : 3;
+    const size_t masksEnd = kInfoHeaderBytes + count * 4;
+    if (masksEnd > bytes.size) {
+        return false;
+    }
+    for (size_t i = 0; i < count; ++i) {
+        dib.masks[i] = Read32(bytes.data + kInfoHeaderBytes + i * 4);
+    }
+    end = std::max(end, masksEnd);
+    return true;
+}
+
 // Fills all but, for files, the place of the pixels, which their own header tells.
 bool ReadHeader(ByteView bytes, Dib& dib) {
     if (bytes.size < kCoreHeaderBytes) {
@@ -147,29 +168,7 @@ bool ReadHeader(ByteView bytes, Dib& dib) {
     dib.height = static_cast<int32_t>(height);
 
     size_t end = headerBytes;
-    const bool hasMasks =
-        dib.packing == Packing::BitFields || dib.packing == Packing::AlphaBitFields;
-    if (hasMasks) {
-        // Behind the oldest header, inside the newer ones.
-        const size_t count = dib.packing == Packing::AlphaBitFields || headerBytes >= 56 ? 4 : 3;
-        const size_t masksEnd = kInfoHeaderBytes + count * 4;
-        if (masksEnd > bytes.size) {
-            return false;
-        }
-        for (size_t i = 0; i < count; ++i) {
-            dib.masks[i] = At32(kInfoHeaderBytes + i * 4);
-        }
-        end = std::max<size_t>(end, masksEnd);
-    } else if (dib.bits == 16) {
-        dib.masks[0] = 0x7C00;
-        dib.masks[1] = 0x03E0;
-        dib.masks[2] = 0x001F;
-    } else {
-        dib.masks[0] = 0xFF0000;
-        dib.masks[1] = 0x00FF00;
-        dib.masks[2] = 0x0000FF;
-    }
-    if (!IsKnown(dib)) {
+    if (!ReadMasks(bytes, headerBytes, end, dib) || !IsKnown(dib)) {
         return false;
     }
     const size_t entryBytes = isCore ? 3 : 4;

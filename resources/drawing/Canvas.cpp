@@ -1,3 +1,4 @@
+// Strokes and lights, and what a drawn picture goes through: blur, bloom, tone, grain.
 #include "resources/drawing/Canvas.h"
 
 namespace kyvdraw {

@@ -1,3 +1,4 @@
+// Gradient noise that repeats.
 #include "resources/drawing/Noise.h"
 
 namespace kyvdraw {

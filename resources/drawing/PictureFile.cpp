@@ -1,3 +1,4 @@
+// Writes pictures as PNG and bitmap files.
 #include "resources/drawing/PictureFile.h"
 
 #include <cstdio>

@@ -2,7 +2,7 @@
 // meets the ground or the water. Lengths are in kilometres.
 #include <optional>
 
-#include "samples/generator/Samples.h"
+#include "resources/samples/Samples.h"
 
 using namespace kyvdraw;
 

@@ -9,7 +9,7 @@
 #include <stdexcept>
 #include <string_view>
 
-#include "samples/generator/Samples.h"
+#include "resources/samples/Samples.h"
 
 using namespace kyvdraw;
 

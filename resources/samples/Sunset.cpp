@@ -1,6 +1,6 @@
 // An evening at sea. The sky is a function of the direction; the water mirrors it in waves that
 // get smaller with the distance.
-#include "samples/generator/Samples.h"
+#include "resources/samples/Samples.h"
 
 using namespace kyvdraw;
 

@@ -5,7 +5,7 @@
 #include <string>
 
 #include "resources/drawing/PictureFile.h"
-#include "samples/generator/Samples.h"
+#include "resources/samples/Samples.h"
 
 using namespace kyvsamples;
 

@@ -1,5 +1,5 @@
 // A town on a river by night: what stands on the bank is drawn first and then mirrored.
-#include "samples/generator/Samples.h"
+#include "resources/samples/Samples.h"
 
 using namespace kyvdraw;
 

@@ -1,7 +1,7 @@
 // Three wooden figures of different complexion beside a colour chart, in soft studio light: skin
 // tones, saturated patches and a grey scale, as a portrait photographer shoots them first.
 // The scene is solids given by their distance; rays step along by it.
-#include "samples/generator/Samples.h"
+#include "resources/samples/Samples.h"
 
 using namespace kyvdraw;
 
