@@ -24,6 +24,7 @@ if(CMAKE_SYSTEM_PROCESSOR MATCHES "^(x86_64|AMD64)$")
     kyv_vector_set(avx512 -mavx512f -mavx512bw -mavx512dq -mavx512vl)
     if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
         # GCC 12 warns of values that its own header leaves open on purpose.
-        target_compile_options(kyv_kernels_avx512 PRIVATE -Wno-maybe-uninitialized)
+        target_compile_options(kyv_kernels_avx512 PRIVATE -Wno-uninitialized
+                               -Wno-maybe-uninitialized)
     endif()
 endif()

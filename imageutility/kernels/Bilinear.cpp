@@ -30,18 +30,8 @@ void Lerp_scalar(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_
     }
 }
 
-constinit const KernelTable<BilinearRow> kBilinear = {
-    .scalar = Bilinear_scalar,
-    .sse2 = KYV_VECTOR_FORM(Bilinear_sse2),
-    .ssse3 = KYV_VECTOR_FORM(Bilinear_ssse3),
-    .avx2 = KYV_VECTOR_FORM(Bilinear_avx2),
-};
+constinit const KernelTable<BilinearRow> kBilinear = {KYV_TABLE(Bilinear)};
 
-constinit const KernelTable<LerpRow> kLerp = {
-    .scalar = Lerp_scalar,
-    .sse2 = KYV_VECTOR_FORM(Lerp_sse2),
-    .ssse3 = KYV_VECTOR_FORM(Lerp_ssse3),
-    .avx2 = KYV_VECTOR_FORM(Lerp_avx2),
-};
+constinit const KernelTable<LerpRow> kLerp = {KYV_TABLE(Lerp)};
 
 } // namespace kyv

@@ -29,19 +29,8 @@ using BilinearRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count,
 using LerpRow = void (*)(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
                          uint32_t fraction);
 
-void Bilinear_scalar(uint8_t* dst, const uint8_t* src, size_t count,
-                     const BilinearColumns& columns);
-void Bilinear_sse2(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns);
-void Bilinear_ssse3(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns);
-void Bilinear_avx2(uint8_t* dst, const uint8_t* src, size_t count, const BilinearColumns& columns);
-void Lerp_scalar(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
-                 uint32_t fraction);
-void Lerp_sse2(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
-               uint32_t fraction);
-void Lerp_ssse3(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
-                uint32_t fraction);
-void Lerp_avx2(uint8_t* dst, const uint8_t* upper, const uint8_t* lower, size_t count,
-               uint32_t fraction);
+KYV_FORMS(BilinearRow, Bilinear)
+KYV_FORMS(LerpRow, Lerp)
 
 extern const KernelTable<BilinearRow> kBilinear;
 extern const KernelTable<LerpRow> kLerp;

@@ -50,28 +50,12 @@ void BoxBlur32_scalar(uint8_t* dst, uint32_t* sums, const uint8_t* enter, const 
     Average(dst, sums, count, windows);
 }
 
-constinit const KernelTable<BoxColumnsRow16> kBoxColumns16 = {
-    .scalar = BoxColumns16_scalar,
-    .sse2 = KYV_VECTOR_FORM(BoxColumns16_sse2),
-    .avx2 = KYV_VECTOR_FORM(BoxColumns16_avx2),
-};
+constinit const KernelTable<BoxColumnsRow16> kBoxColumns16 = {KYV_TABLE(BoxColumns16)};
 
-constinit const KernelTable<BoxColumnsRow32> kBoxColumns32 = {
-    .scalar = BoxColumns32_scalar,
-    .sse2 = KYV_VECTOR_FORM(BoxColumns32_sse2),
-    .avx2 = KYV_VECTOR_FORM(BoxColumns32_avx2),
-};
+constinit const KernelTable<BoxColumnsRow32> kBoxColumns32 = {KYV_TABLE(BoxColumns32)};
 
-constinit const KernelTable<BoxBlurRow16> kBoxBlur16 = {
-    .scalar = BoxBlur16_scalar,
-    .sse2 = KYV_VECTOR_FORM(BoxBlur16_sse2),
-    .avx2 = KYV_VECTOR_FORM(BoxBlur16_avx2),
-};
+constinit const KernelTable<BoxBlurRow16> kBoxBlur16 = {KYV_TABLE(BoxBlur16)};
 
-constinit const KernelTable<BoxBlurRow32> kBoxBlur32 = {
-    .scalar = BoxBlur32_scalar,
-    .sse2 = KYV_VECTOR_FORM(BoxBlur32_sse2),
-    .avx2 = KYV_VECTOR_FORM(BoxBlur32_avx2),
-};
+constinit const KernelTable<BoxBlurRow32> kBoxBlur32 = {KYV_TABLE(BoxBlur32)};
 
 } // namespace kyv

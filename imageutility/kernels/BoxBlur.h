@@ -74,27 +74,10 @@ constexpr AreaReciprocal ReciprocalOf(int32_t area) {
 
 // --- Forms
 
-void BoxColumns16_scalar(uint16_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
-void BoxColumns16_sse2(uint16_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
-void BoxColumns16_avx2(uint16_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
-
-void BoxColumns32_scalar(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
-void BoxColumns32_sse2(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
-void BoxColumns32_avx2(uint32_t* sums, const uint8_t* enter, const uint8_t* leave, size_t count);
-
-void BoxBlur16_scalar(uint8_t* dst, uint16_t* sums, const uint8_t* enter, const uint8_t* leave,
-                      size_t count, const BoxWindows& windows);
-void BoxBlur16_sse2(uint8_t* dst, uint16_t* sums, const uint8_t* enter, const uint8_t* leave,
-                    size_t count, const BoxWindows& windows);
-void BoxBlur16_avx2(uint8_t* dst, uint16_t* sums, const uint8_t* enter, const uint8_t* leave,
-                    size_t count, const BoxWindows& windows);
-
-void BoxBlur32_scalar(uint8_t* dst, uint32_t* sums, const uint8_t* enter, const uint8_t* leave,
-                      size_t count, const BoxWindows& windows);
-void BoxBlur32_sse2(uint8_t* dst, uint32_t* sums, const uint8_t* enter, const uint8_t* leave,
-                    size_t count, const BoxWindows& windows);
-void BoxBlur32_avx2(uint8_t* dst, uint32_t* sums, const uint8_t* enter, const uint8_t* leave,
-                    size_t count, const BoxWindows& windows);
+KYV_FORMS(BoxColumnsRow16, BoxColumns16)
+KYV_FORMS(BoxColumnsRow32, BoxColumns32)
+KYV_FORMS(BoxBlurRow16, BoxBlur16)
+KYV_FORMS(BoxBlurRow32, BoxBlur32)
 
 extern const KernelTable<BoxColumnsRow16> kBoxColumns16;
 extern const KernelTable<BoxColumnsRow32> kBoxColumns32;

@@ -32,10 +32,6 @@ void CompositeOver_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_
     }
 }
 
-constinit const KernelTable<CompositeOverRow> kCompositeOver = {
-    .scalar = CompositeOver_scalar,
-    .sse2 = KYV_VECTOR_FORM(CompositeOver_sse2),
-    .avx2 = KYV_VECTOR_FORM(CompositeOver_avx2),
-};
+constinit const KernelTable<CompositeOverRow> kCompositeOver = {KYV_TABLE(CompositeOver)};
 
 } // namespace kyv

@@ -12,9 +12,7 @@ namespace kyv {
 // grows. dst may be src itself but must not overlap it otherwise.
 using CompositeOverRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
 
-void CompositeOver_scalar(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
-void CompositeOver_sse2(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
-void CompositeOver_avx2(uint8_t* dst, const uint8_t* src, size_t count, uint8_t opacity);
+KYV_FORMS(CompositeOverRow, CompositeOver)
 
 extern const KernelTable<CompositeOverRow> kCompositeOver;
 

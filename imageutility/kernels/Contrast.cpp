@@ -14,11 +14,6 @@ void Contrast_scalar(uint8_t* pixels, size_t count, int32_t factor) {
     }
 }
 
-constinit const KernelTable<ContrastRow> kContrast = {
-    .scalar = Contrast_scalar,
-    .sse2 = KYV_VECTOR_FORM(Contrast_sse2),
-    .ssse3 = KYV_VECTOR_FORM(Contrast_ssse3),
-    .avx2 = KYV_VECTOR_FORM(Contrast_avx2),
-};
+constinit const KernelTable<ContrastRow> kContrast = {KYV_TABLE(Contrast)};
 
 } // namespace kyv

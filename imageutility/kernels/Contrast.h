@@ -12,10 +12,7 @@ namespace kyv {
 // kept. factor is 0..8192.
 using ContrastRow = void (*)(uint8_t* pixels, size_t count, int32_t factor);
 
-void Contrast_scalar(uint8_t* pixels, size_t count, int32_t factor);
-void Contrast_sse2(uint8_t* pixels, size_t count, int32_t factor);
-void Contrast_ssse3(uint8_t* pixels, size_t count, int32_t factor);
-void Contrast_avx2(uint8_t* pixels, size_t count, int32_t factor);
+KYV_FORMS(ContrastRow, Contrast)
 
 extern const KernelTable<ContrastRow> kContrast;
 

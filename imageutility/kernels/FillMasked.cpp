@@ -14,10 +14,6 @@ void FillMasked_scalar(uint8_t* pixels, size_t count, uint32_t keep, uint32_t va
     }
 }
 
-constinit const KernelTable<FillMaskedRow> kFillMasked = {
-    .scalar = FillMasked_scalar,
-    .sse2 = KYV_VECTOR_FORM(FillMasked_sse2),
-    .avx2 = KYV_VECTOR_FORM(FillMasked_avx2),
-};
+constinit const KernelTable<FillMaskedRow> kFillMasked = {KYV_TABLE(FillMasked)};
 
 } // namespace kyv

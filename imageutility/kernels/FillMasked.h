@@ -11,9 +11,7 @@ namespace kyv {
 // Each of count pixels, as a word 0xAARRGGBB, becomes (pixel & keep) | value.
 using FillMaskedRow = void (*)(uint8_t* pixels, size_t count, uint32_t keep, uint32_t value);
 
-void FillMasked_scalar(uint8_t* pixels, size_t count, uint32_t keep, uint32_t value);
-void FillMasked_sse2(uint8_t* pixels, size_t count, uint32_t keep, uint32_t value);
-void FillMasked_avx2(uint8_t* pixels, size_t count, uint32_t keep, uint32_t value);
+KYV_FORMS(FillMaskedRow, FillMasked)
 
 extern const KernelTable<FillMaskedRow> kFillMasked;
 

@@ -16,10 +16,6 @@ void ToARGB_scalar(uint8_t* dst, const uint8_t* src, size_t count) {
     }
 }
 
-constinit const KernelTable<ToARGBRow> kToARGB = {
-    .scalar = ToARGB_scalar,
-    .sse2 = KYV_VECTOR_FORM(ToARGB_sse2),
-    .avx2 = KYV_VECTOR_FORM(ToARGB_avx2),
-};
+constinit const KernelTable<ToARGBRow> kToARGB = {KYV_TABLE(ToARGB)};
 
 } // namespace kyv

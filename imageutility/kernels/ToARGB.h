@@ -11,9 +11,7 @@ namespace kyv {
 // count pixels; dst may be src itself but must not overlap it otherwise.
 using ToARGBRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count);
 
-void ToARGB_scalar(uint8_t* dst, const uint8_t* src, size_t count);
-void ToARGB_sse2(uint8_t* dst, const uint8_t* src, size_t count);
-void ToARGB_avx2(uint8_t* dst, const uint8_t* src, size_t count);
+KYV_FORMS(ToARGBRow, ToARGB)
 
 extern const KernelTable<ToARGBRow> kToARGB;
 

@@ -16,11 +16,6 @@ void ToAYUV_scalar(uint8_t* dst, const uint8_t* src, size_t count) {
     }
 }
 
-constinit const KernelTable<ToAYUVRow> kToAYUV = {
-    .scalar = ToAYUV_scalar,
-    .sse2 = KYV_VECTOR_FORM(ToAYUV_sse2),
-    .ssse3 = KYV_VECTOR_FORM(ToAYUV_ssse3),
-    .avx2 = KYV_VECTOR_FORM(ToAYUV_avx2),
-};
+constinit const KernelTable<ToAYUVRow> kToAYUV = {KYV_TABLE(ToAYUV)};
 
 } // namespace kyv

@@ -11,10 +11,7 @@ namespace kyv {
 // count pixels; dst may be src itself but must not overlap it otherwise.
 using ToAYUVRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count);
 
-void ToAYUV_scalar(uint8_t* dst, const uint8_t* src, size_t count);
-void ToAYUV_sse2(uint8_t* dst, const uint8_t* src, size_t count);
-void ToAYUV_ssse3(uint8_t* dst, const uint8_t* src, size_t count);
-void ToAYUV_avx2(uint8_t* dst, const uint8_t* src, size_t count);
+KYV_FORMS(ToAYUVRow, ToAYUV)
 
 extern const KernelTable<ToAYUVRow> kToAYUV;
 

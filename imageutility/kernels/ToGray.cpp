@@ -20,17 +20,8 @@ void ToGrayBytes_scalar(uint8_t* dst, const uint8_t* src, size_t count) {
     }
 }
 
-constinit const KernelTable<ToGrayRow> kToGray = {
-    .scalar = ToGray_scalar,
-    .sse2 = KYV_VECTOR_FORM(ToGray_sse2),
-    .ssse3 = KYV_VECTOR_FORM(ToGray_ssse3),
-    .avx2 = KYV_VECTOR_FORM(ToGray_avx2),
-};
+constinit const KernelTable<ToGrayRow> kToGray = {KYV_TABLE(ToGray)};
 
-constinit const KernelTable<ToGrayBytesRow> kToGrayBytes = {
-    .scalar = ToGrayBytes_scalar,
-    .sse2 = KYV_VECTOR_FORM(ToGrayBytes_sse2),
-    .avx2 = KYV_VECTOR_FORM(ToGrayBytes_avx2),
-};
+constinit const KernelTable<ToGrayBytesRow> kToGrayBytes = {KYV_TABLE(ToGrayBytes)};
 
 } // namespace kyv

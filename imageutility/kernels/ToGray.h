@@ -13,13 +13,8 @@ using ToGrayRow = void (*)(uint8_t* pixels, size_t count);
 // count bytes of luma; dst and src must not overlap.
 using ToGrayBytesRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count);
 
-void ToGray_scalar(uint8_t* pixels, size_t count);
-void ToGray_sse2(uint8_t* pixels, size_t count);
-void ToGray_ssse3(uint8_t* pixels, size_t count);
-void ToGray_avx2(uint8_t* pixels, size_t count);
-void ToGrayBytes_scalar(uint8_t* dst, const uint8_t* src, size_t count);
-void ToGrayBytes_sse2(uint8_t* dst, const uint8_t* src, size_t count);
-void ToGrayBytes_avx2(uint8_t* dst, const uint8_t* src, size_t count);
+KYV_FORMS(ToGrayRow, ToGray)
+KYV_FORMS(ToGrayBytesRow, ToGrayBytes)
 
 extern const KernelTable<ToGrayRow> kToGray;
 extern const KernelTable<ToGrayBytesRow> kToGrayBytes;

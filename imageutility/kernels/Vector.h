@@ -16,30 +16,42 @@
 //   Block           128 bits
 //   kBytes, kWords, kPixels, kLongs: lanes of 8, 16, 32 and 64 bits in a Vec
 //
-// Memory     Load Store LoadHalf StoreHalf LoadBytes16 LoadBytes32 LoadWords32 StoreBytes16
-//            LoadF32 StoreF32; all unaligned. LoadBytes16: kWords bytes as words; StoreBytes16: the
-//            way back, words of 0..255. LoadBytes32, LoadWords32: kPixels bytes or words as 32
-//            bits.
-// Blocks     LoadBlock LoadHalves (two times 8 bytes) FromBlocks (one from a function of its
-// number)
-//            GetBlock Repeat (the same block everywhere)
-// Constants  Zero Splat8 Splat16 Splat32 Splat64 PixelWords (four words, repeated) PairOfWords (low
-//            and high word of every 32 bits) Ascending32 (0, 1, 2 ...)
-// Bits       And Or Xor ClearBits(v, bits) Select(mask, yes, no): masks are all ones or zeros
-// Compare    Equal8 Equal16 Equal32 GreaterS16 GreaterS32 -> mask; AllSet AnySet of a mask
-// Arithmetic Add8 Add16 Add32 AddSatU8 Sub8 Sub16 Sub32 SubSatU8 SubSatU16 AverageU8 AverageU16
-//            (rounded up) MinU8 MaxU8 MinS16 MaxS16 MulLow16 MulLow32 MulHighU16 MulHighS16
-//            MulAddPairs16 (a0 * b0 + a1 * b1, signed, 32 bits) MulRound15
+// Memory     Load Store LoadF32 StoreF32: unaligned, as all of them. LoadHalf: half a vector, the
+//            rest is undefined. LoadBytes16, LoadBytes32, LoadWords32: bytes or words as wider
+//            numbers, a vector full; StoreBytes16: words of 0..255 as bytes. StorePixel32.
+// Blocks     LoadBlock LoadHalves (eight bytes from each of two places) LoadInTurns32
+//            LoadBlockWords32 AddBlocks32 SubBlocks32; FromBlocks (each from a function of its
+//            number) Repeat (the same in every block) RepeatBytes FirstBlock SumOfBlocks32
+//            RunningSums32(total, changes): adds one block after the other to total, and gives all
+//            totals on the way; SpreadOverBlocks32: kBlocks numbers, each four times
+// Constants  Zero Splat8 .. Splat64 PixelWords (four words, repeated) PairOfWords (the low and the
+//            high word of every 32 bits) Ascending32 (0, 1, 2 ...)
+// Bits       And Or Xor ClearBits(v, bits) Select(mask, yes, no)
+// Compare    Equal8 .. Equal32 GreaterS16 GreaterS32 give masks, all ones or zeros in a lane;
+// AllSet
+//            and AnySet of a mask
+// Arithmetic Add8 .. Add32 Sub8 .. Sub32 AddSatU8 SubSatU8 SubSatU16 AverageU8 AverageU16 (rounded
+//            up) MinU8 MaxU8 MinS16 MaxS16 MulLow16 MulLow32 MulHighU16 MulHighS16 MulHighU32
+//            MulAddPairs16: a0 * b0 + a1 * b1 of signed words in 32 bits; MulRound15: (a * b +
+//            2^14)
+//            >> 15 for a within -2^14 .. 2^14 - 1
 // Shifts     ShiftLeft16<n> ShiftRight16<n> ShiftRightS16<n>, the same with 32, ShiftLeft64
 //            ShiftRight64; ShiftRightBy32(v, n) by a number known only when it runs
-// Lanes      InterleaveLow8 .. 64 InterleaveHigh8 .. 64 PackU16 (words to bytes, saturated) PackS16
-//            (to signed bytes) PackS32 (to words) MixWords(even, odd) TwiceLow16 DoubleLow32
-//            DoubleHigh32 InterleaveHalves16 AlphaWords InOrder32 InOrder64
+// Lanes      InterleaveLow8 .. 64, InterleaveHigh8 .. 64 of each block's first or last half;
+// PackU16
+//            (words to bytes, saturated) PackS16 (to signed bytes) PackS32 (to words); InOrder32
+//            and InOrder64 undo what two packings, or one, do to the order of blocks. WidenLow8
+//            WidenHigh8: a block's bytes as words. ExtendLowS16 ExtendHighS16: the vector's first
+//            or last half as 32 bits. MixWords(even, odd) TwiceLow16 DoubleLow32 DoubleHigh32
+//            DoubleEach64 (of half a vector) InterleaveHalves16 AlphaWords SpreadHighWords
+//            SecondBytes
 // Floats     SplatF32 AddF32 SubF32 MulF32 DivF32 MinF32 MaxF32 SqrtF32 F32FromS32 TruncateF32
-//            (the last operand of MinF32 and MaxF32 is the result where one is not a number)
-// Doubles    the same with 64, NegateF64 LowF64 HighF64 (of Floats) ToFloats(low, high) AsVec64
-//            FlipSign64 SelectLessF64
-// From SSSE3 on (kHasByteShuffle): ShuffleBytes(v, indices) MulAddBytes (unsigned times signed)
+//            AsFloats (the bits); MinF32 and MaxF32 give the last operand where one is not a number
+// Doubles    SplatF64 AddF64 SubF64 MulF64 DivF64 MinF64 MaxF64 SqrtF64, kLongs of them
+// Bytes      ShuffleBytes(v, indices) within each block, 0 for an index below 0; MulAddBytes
+//            (unsigned, signed): words a0 * b0 + a1 * b1, saturated.
+// ShuffleBytes, MulAddBytes and MixWords take several instructions where kHasByteShuffle,
+// kHasMulAddBytes or kHasMixWords is false; a kernel that has another way may ask.
 #pragma once
 
 #include <stddef.h>

@@ -162,9 +162,10 @@ KYV_UNARY(Doubles, SqrtF64, Doubles, sqrt_pd)
 // --- Byte shuffles and products, from SSSE3 on
 
 #if defined(KYV_VECTOR_SET_SSE2)
+// These two take many instructions here, so kernels ask first.
 inline constexpr bool kHasByteShuffle = false;
+inline constexpr bool kHasMulAddBytes = false;
 
-// These two take many instructions here; kernels that have another way ask kHasByteShuffle.
 inline Vec ShuffleBytes(Vec v, Vec indices) {
     uint8_t from[16], at[16], to[16];
     Store(from, v);
@@ -181,11 +182,10 @@ inline Vec MulAddBytes(Vec unsignedBytes, Vec signedBytes) {
     return _mm_adds_epi16(even, odd);
 }
 
-// (a * b + 2^14) >> 15 for a within -2^14 .. 2^14 - 1: the half is the top bit of what the high
-// half of the product of 2a leaves out.
-inline Vec MulRound15(Vec a, Vec b) {
-    const Vec twice = Add16(a, a);
-    return Add16(MulHighS16(twice, b), ShiftRight16<15>(MulLow16(twice, b)));
+inline Vec MulRound20(Vec a, Vec b) {
+    // The half is the top bit of what the high half of the product leaves out.
+    const Vec x = ShiftRightS16<4>(a);
+    return Add16(MulHighS16(x, b), ShiftRight16<15>(MulLow16(x, b)));
 }
 inline Vec AlphaWords(Vec pixels) {
     const Vec alpha = ShiftRight32<24>(pixels);
@@ -194,14 +194,30 @@ inline Vec AlphaWords(Vec pixels) {
 inline Vec InterleaveHalves16(Vec v) {
     return _mm_unpacklo_epi16(v, _mm_unpackhi_epi64(v, v));
 }
+inline Vec SpreadHighWords(Vec v) {
+    const Vec one = _mm_srli_epi32(v, 16);
+    return Or(Or(one, _mm_slli_epi32(one, 8)), _mm_slli_epi32(one, 16));
+}
+inline Vec SecondBytes(Vec v) {
+    return And(_mm_srli_epi32(v, 8), Splat32(0xFF00));
+}
 #else
 inline constexpr bool kHasByteShuffle = true;
+inline constexpr bool kHasMulAddBytes = true;
 
 // Within each block the byte that the index names, or 0 for an index below 0.
 KYV_BINARY(Vec, ShuffleBytes, shuffle_epi8)
 // Words a0 * b0 + a1 * b1, saturated.
 KYV_BINARY(Vec, MulAddBytes, maddubs_epi16)
-KYV_BINARY(Vec, MulRound15, mulhrs_epi16)
+inline Vec MulRound20(Vec a, Vec b) {
+    return KYV_MM(mulhrs_epi16)(ShiftRightS16<5>(a), b);
+}
+#endif
+
+#if defined(KYV_VECTOR_SET_SSE2) || defined(KYV_VECTOR_SET_SSSE3)
+inline constexpr bool kHasMixWords = false;
+#else
+inline constexpr bool kHasMixWords = true;
 #endif
 
 // --- AVX-512
@@ -274,6 +290,44 @@ inline Vec InOrder32(Vec v) {
 inline Vec InOrder64(Vec v) {
     return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), v);
 }
+inline Vec DoubleEach64(Vec half) {
+    return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 0, 1, 1, 2, 2, 3, 3), half);
+}
+inline Vec ExtendLowS16(Vec words) {
+    return _mm512_cvtepi16_epi32(_mm512_castsi512_si256(words));
+}
+inline Vec ExtendHighS16(Vec words) {
+    return _mm512_cvtepi16_epi32(_mm512_extracti64x4_epi64(words, 1));
+}
+inline Vec MulHighU32(Vec a, Vec b) {
+    const Vec even = _mm512_mul_epu32(a, b);
+    const Vec odd = _mm512_mul_epu32(_mm512_srli_epi64(a, 32), _mm512_srli_epi64(b, 32));
+    return _mm512_mask_blend_epi32(0xAAAA, _mm512_srli_epi64(even, 32), odd);
+}
+inline Floats AsFloats(Vec bits) {
+    return _mm512_castsi512_ps(bits);
+}
+inline Block FirstBlock(Vec v) {
+    return _mm512_castsi512_si128(v);
+}
+inline Vec SpreadOverBlocks32(const void* from) {
+    return _mm512_permutexvar_epi32(
+        _mm512_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1, 2, 2, 2, 2, 3, 3, 3, 3),
+        _mm512_castsi128_si512(_mm_loadu_si128(static_cast<const __m128i*>(from))));
+}
+inline Block SumOfBlocks32(Vec v) {
+    const __m256i two =
+        _mm256_add_epi32(_mm512_castsi512_si256(v), _mm512_extracti64x4_epi64(v, 1));
+    return _mm_add_epi32(_mm256_castsi256_si128(two), _mm256_extracti128_si256(two, 1));
+}
+inline Vec RunningSums32(Block& total, Vec change) {
+    const Vec zero = _mm512_setzero_si512();
+    const Vec two = _mm512_add_epi32(change, _mm512_alignr_epi32(change, zero, 12));
+    const Vec all = _mm512_add_epi32(two, _mm512_alignr_epi32(two, zero, 8));
+    const Vec sums = _mm512_add_epi32(all, _mm512_broadcast_i32x4(total));
+    total = _mm_add_epi32(total, _mm512_extracti32x4_epi32(all, 3));
+    return sums;
+}
 
 // --- AVX2
 
@@ -332,6 +386,39 @@ inline Vec InOrder32(Vec v) {
 }
 inline Vec InOrder64(Vec v) {
     return _mm256_permute4x64_epi64(v, _MM_SHUFFLE(3, 1, 2, 0));
+}
+inline Vec DoubleEach64(Vec half) {
+    return _mm256_permute4x64_epi64(half, _MM_SHUFFLE(1, 1, 0, 0));
+}
+inline Vec ExtendLowS16(Vec words) {
+    return _mm256_cvtepi16_epi32(_mm256_castsi256_si128(words));
+}
+inline Vec ExtendHighS16(Vec words) {
+    return _mm256_cvtepi16_epi32(_mm256_extracti128_si256(words, 1));
+}
+inline Vec MulHighU32(Vec a, Vec b) {
+    const Vec even = _mm256_mul_epu32(a, b);
+    const Vec odd = _mm256_mul_epu32(_mm256_srli_epi64(a, 32), _mm256_srli_epi64(b, 32));
+    return _mm256_blend_epi32(_mm256_srli_epi64(even, 32), odd, 0xAA);
+}
+inline Floats AsFloats(Vec bits) {
+    return _mm256_castsi256_ps(bits);
+}
+inline Block FirstBlock(Vec v) {
+    return _mm256_castsi256_si128(v);
+}
+inline Vec SpreadOverBlocks32(const void* from) {
+    return _mm256_permutevar8x32_epi32(
+        _mm256_castsi128_si256(_mm_loadl_epi64(static_cast<const __m128i*>(from))),
+        _mm256_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1));
+}
+inline Block SumOfBlocks32(Vec v) {
+    return _mm_add_epi32(_mm256_castsi256_si128(v), _mm256_extracti128_si256(v, 1));
+}
+inline Vec RunningSums32(Block& total, Vec change) {
+    const Block first = _mm_add_epi32(total, _mm256_castsi256_si128(change));
+    total = _mm_add_epi32(first, _mm256_extracti128_si256(change, 1));
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(first), total, 1);
 }
 
 // --- SSE2 and SSSE3
@@ -399,6 +486,38 @@ inline Vec InOrder32(Vec v) {
 inline Vec InOrder64(Vec v) {
     return v;
 }
+inline Vec DoubleEach64(Vec half) {
+    return _mm_unpacklo_epi64(half, half);
+}
+inline Vec ExtendLowS16(Vec words) {
+    return _mm_unpacklo_epi16(words, _mm_srai_epi16(words, 15));
+}
+inline Vec ExtendHighS16(Vec words) {
+    return _mm_unpackhi_epi16(words, _mm_srai_epi16(words, 15));
+}
+inline Vec MulHighU32(Vec a, Vec b) {
+    const Vec even = _mm_mul_epu32(a, b);
+    const Vec odd = _mm_mul_epu32(_mm_srli_epi64(a, 32), _mm_srli_epi64(b, 32));
+    return Or(_mm_srli_epi64(even, 32), And(odd, Splat64(0xFFFFFFFF00000000)));
+}
+inline Floats AsFloats(Vec bits) {
+    return _mm_castsi128_ps(bits);
+}
+inline Block FirstBlock(Vec v) {
+    return v;
+}
+inline Vec SpreadOverBlocks32(const void* from) {
+    int value;
+    __builtin_memcpy(&value, from, sizeof value);
+    return _mm_set1_epi32(value);
+}
+inline Block SumOfBlocks32(Vec v) {
+    return v;
+}
+inline Vec RunningSums32(Block& total, Vec change) {
+    total = _mm_add_epi32(total, change);
+    return total;
+}
 
 #endif
 
@@ -409,6 +528,28 @@ inline Block LoadBlock(const void* from) {
 inline Block LoadHalves(const void* first, const void* second) {
     return _mm_unpacklo_epi64(_mm_loadl_epi64(static_cast<const __m128i*>(first)),
                               _mm_loadl_epi64(static_cast<const __m128i*>(second)));
+}
+// Four bytes from one place, four from another, and so once more.
+inline Block LoadInTurns32(const void* first, const void* second) {
+    return _mm_unpacklo_epi32(_mm_loadl_epi64(static_cast<const __m128i*>(first)),
+                              _mm_loadl_epi64(static_cast<const __m128i*>(second)));
+}
+// Four words as 32 bits.
+inline Block LoadBlockWords32(const uint16_t* from) {
+    return _mm_unpacklo_epi16(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(from)),
+                              _mm_setzero_si128());
+}
+inline Block AddBlocks32(Block a, Block b) {
+    return _mm_add_epi32(a, b);
+}
+inline Block SubBlocks32(Block a, Block b) {
+    return _mm_sub_epi32(a, b);
+}
+// The first block's four numbers as the bytes of a pixel, saturated.
+inline void StorePixel32(uint8_t* to, Vec v) {
+    const Block words = _mm_packs_epi32(FirstBlock(v), _mm_setzero_si128());
+    const int pixel = _mm_cvtsi128_si32(_mm_packus_epi16(words, words));
+    __builtin_memcpy(to, &pixel, sizeof pixel);
 }
 // Sixteen bytes, the same in every block.
 inline Vec RepeatBytes(const int8_t (&bytes)[16]) {
@@ -424,6 +565,15 @@ inline Vec AlphaWords(Vec pixels) {
 // The words of each block's first half, each followed by one of the second half.
 inline Vec InterleaveHalves16(Vec v) {
     return ShuffleBytes(v, RepeatBytes({0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15}));
+}
+// A pixel's high word, which is below 256, in its first three bytes; the last is 0.
+inline Vec SpreadHighWords(Vec v) {
+    return ShuffleBytes(v, RepeatBytes({2, 2, 2, -1, 6, 6, 6, -1, 10, 10, 10, -1, 14, 14, 14, -1}));
+}
+// The low byte of a pixel's high word as its second byte; the rest is 0.
+inline Vec SecondBytes(Vec v) {
+    return ShuffleBytes(
+        v, RepeatBytes({-1, 2, -1, -1, -1, 6, -1, -1, -1, 10, -1, -1, -1, 14, -1, -1}));
 }
 #endif
 
