@@ -6,7 +6,7 @@
 #include <numeric>
 #include <optional>
 
-#include "hosting/ExitStatus.h"
+#include "host/ExitStatus.h"
 #include "hosting/Text.h"
 
 namespace kyvhost {

@@ -12,6 +12,7 @@
 #include <nlohmann/json.hpp>
 
 #include "host/Clip.h"
+#include "host/Hosting.h"
 #include "hosting/Names.h"
 
 namespace kyvhost {
@@ -47,7 +48,7 @@ Picture Pattern(const Size& size, uint32_t seed) {
 
 struct Contestant {
     int32_t level;
-    std::unique_ptr<CInstance> instance;
+    std::unique_ptr<CClipInstance> instance;
     std::vector<double> ms;
 
     double Median() {
@@ -65,14 +66,14 @@ double MsOf(const std::function<void()>& work) {
 } // namespace
 
 void Bench(const ModuleDescriptor& module, const BenchOptions& options) {
-    const EffectDescriptor& effect = FindEffect(module, options.effect);
+    const EffectDescriptor& effect = FindEffect(module, options.effect, kAllEffects);
     const FrameShape shape = {options.size.width, options.size.height, false};
     std::vector<Contestant> contestants;
     for (const int32_t level : options.levels) {
-        contestants.push_back({level, std::make_unique<CInstance>(effect), {}});
+        contestants.push_back({level, std::make_unique<CClipInstance>(effect), {}});
         EffectSettings settings = options.settings;
         settings.level = level;
-        CInstance& instance = *contestants.back().instance;
+        CClipInstance& instance = *contestants.back().instance;
         settings.Apply(instance);
         instance.Context().duration = PositionOfFrame(3600 * kRate.num, kRate);
         instance.Begin(shape);
@@ -84,7 +85,7 @@ void Bench(const ModuleDescriptor& module, const BenchOptions& options) {
     std::vector<uint8_t> output(shape.Bytes());
     std::vector<double> copies;
 
-    const auto renderFrame = [&](CInstance& instance, int64_t frame) {
+    const auto renderFrame = [&](CClipInstance& instance, int64_t frame) {
         instance.Context().position = PositionOfFrame(frame, kRate);
         instance.Render(inputs, output.data(), frame);
     };

@@ -5,7 +5,7 @@
 
 #include <nlohmann/json.hpp>
 
-#include "hosting/Instance.h"
+#include "host/ClipInstance.h"
 #include "hosting/Names.h"
 #include "hosting/Text.h"
 #include "hosting/Values.h"
@@ -141,7 +141,7 @@ std::string ListJson(const ModuleDescriptor& module) {
 }
 
 std::string InfoText(const EffectDescriptor& effect) {
-    const CInstance instance(effect);
+    const CClipInstance instance(effect);
     const std::string description = Description(effect);
     std::string text = EffectName(effect) + " (" + ShortName(effect) + ")\n" +
                        (description.empty() ? "" : description + ".\n") +
@@ -161,7 +161,7 @@ std::string InfoText(const EffectDescriptor& effect) {
 }
 
 std::string InfoJson(const EffectDescriptor& effect) {
-    const CInstance instance(effect);
+    const CClipInstance instance(effect);
     json entry = EffectJson(effect);
     entry["parameters"] = json::array();
     for (uint32_t i = 0; i < effect.paramCount; ++i) {

@@ -3,6 +3,7 @@
 
 #include <string>
 
+#include "host/Hosting.h"
 #include "hosting/Module.h"
 
 namespace kyvhost {

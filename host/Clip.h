@@ -6,10 +6,10 @@
 #include <memory>
 #include <thread>
 
+#include "host/ClipInstance.h"
 #include "host/FrameQueue.h"
 #include "host/Picture.h"
 #include "host/Video.h"
-#include "hosting/Instance.h"
 
 namespace kyvhost {
 

@@ -15,11 +15,14 @@
 #include "host/Bench.h"
 #include "host/Catalogue.h"
 #include "host/Gallery.h"
+#include "host/Hosting.h"
 #include "host/Render.h"
+#include "hosting/Error.h"
 #include "hosting/Module.h"
 #include "hosting/Names.h"
 #include "hosting/Suggest.h"
 #include "hosting/Text.h"
+#include "platform/Process.h"
 
 namespace kyvhost {
 namespace {
@@ -93,6 +96,18 @@ fs::path ParsePath(std::string_view what, std::string_view text) {
         throw CUsageError(std::string(what) + " is empty: name a file");
     }
     return PathOf(text);
+}
+
+// Where the module lies when the user names none: beside the program, else where the build tree
+// and an installation have it.
+fs::path DefaultModuleFile() {
+    const fs::path folder = kyv::ExecutableFile().parent_path();
+    const fs::path file = FindModuleFile({folder, folder / "../module", folder / "../lib"});
+    if (file.empty()) {
+        throw CModuleError("no " KYV_MODULE_NAME " beside " + TextOf(folder / "kyvhost") +
+                           "; name the module with --module FILE");
+    }
+    return file;
 }
 
 class CCommandLine {
@@ -347,7 +362,7 @@ private:
 
     void Info() {
         const CModule module = Load();
-        const EffectDescriptor& effect = FindEffect(module.Descriptor(), m_effect);
+        const EffectDescriptor& effect = FindEffect(module.Descriptor(), m_effect, kAllEffects);
         std::fputs((m_bJson ? InfoJson : InfoText)(effect).c_str(), stdout);
     }
 
@@ -441,6 +456,10 @@ ExitStatus RunCommandLine(const std::vector<std::string>& arguments) {
         return ExitStatus::Done;
     } catch (const CHostError& error) {
         return Complain(error.Status(), error.what());
+    } catch (const CUsageError& error) {
+        return Complain(ExitStatus::WrongUse, error.what());
+    } catch (const CModuleError& error) {
+        return Complain(ExitStatus::ModuleNotUsable, error.what());
     } catch (const std::bad_alloc&) {
         return Complain(ExitStatus::RenderingFailed, "there is not enough memory");
     } catch (const std::exception& error) {

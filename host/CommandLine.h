@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "hosting/ExitStatus.h"
+#include "host/ExitStatus.h"
 
 namespace kyvhost {
 

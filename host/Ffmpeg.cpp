@@ -5,6 +5,7 @@
 #include <system_error>
 #include <utility>
 
+#include "host/Hosting.h"
 #include "hosting/Text.h"
 
 namespace kyvhost {

@@ -7,8 +7,8 @@
 #include <thread>
 #include <vector>
 
+#include "host/ExitStatus.h"
 #include "host/Interrupt.h"
-#include "hosting/ExitStatus.h"
 #include "platform/Process.h"
 
 namespace kyvhost {

@@ -7,10 +7,10 @@
 
 #include "host/AyuvFrame.h"
 #include "host/Clip.h"
+#include "host/ExitStatus.h"
 #include "host/Lettering.h"
 #include "host/OutputFile.h"
 #include "host/Picture.h"
-#include "hosting/ExitStatus.h"
 #include "hosting/Names.h"
 #include "hosting/Text.h"
 
@@ -87,7 +87,7 @@ Tile RenderTile(const EffectDescriptor& effect, const EffectSettings& settings,
     const Scene scene = SceneOf(effect);
     EffectSettings own = settings;
     own.sets = scene.sets;
-    CInstance instance(effect);
+    CClipInstance instance(effect);
     own.Apply(instance);
     instance.Context().position = std::llround(scene.seconds * 1e7);
     instance.Context().duration = std::llround(kClipSeconds * 1e7);

@@ -5,8 +5,8 @@
 #include <cstdlib>
 #include <mutex>
 
+#include "host/ExitStatus.h"
 #include "host/Progress.h"
-#include "hosting/ExitStatus.h"
 #include "platform/Console.h"
 
 namespace kyvhost {

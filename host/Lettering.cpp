@@ -7,6 +7,7 @@
 
 #include <stb/stb_truetype.h>
 
+#include "host/Hosting.h"
 #include "hosting/Text.h"
 
 extern "C" const unsigned char kyvhost_font[]; // Font.S

@@ -6,7 +6,7 @@
 #include <random>
 #include <system_error>
 
-#include "hosting/ExitStatus.h"
+#include "host/ExitStatus.h"
 #include "hosting/Hex.h"
 #include "hosting/Text.h"
 

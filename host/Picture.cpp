@@ -10,8 +10,8 @@
 
 #include <stb/stb_image_resize.h>
 
+#include "host/ExitStatus.h"
 #include "host/PictureFile.h"
-#include "hosting/ExitStatus.h"
 #include "hosting/Text.h"
 #include "platform/ImageFile.h"
 

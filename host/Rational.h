@@ -4,7 +4,11 @@
 #include <cstdint>
 #include <string>
 
+#include "hosting/Text.h"
+
 namespace kyvhost {
+
+using kyvhosting::TextOf; // paths; the one below would hide it
 
 struct Rational {
     int64_t num = 0;

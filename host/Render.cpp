@@ -8,10 +8,10 @@
 
 #include "host/AyuvFrame.h"
 #include "host/Clip.h"
+#include "host/ExitStatus.h"
 #include "host/OutputFile.h"
 #include "host/Picture.h"
 #include "host/Progress.h"
-#include "hosting/ExitStatus.h"
 #include "hosting/Names.h"
 #include "hosting/Text.h"
 
@@ -82,7 +82,8 @@ struct Timeline {
 class CRendering {
 public:
     CRendering(const ModuleDescriptor& module, const RenderOptions& options)
-        : m_options(options), m_effect(FindEffect(module, options.effect)), m_instance(m_effect) {
+        : m_options(options), m_effect(FindEffect(module, options.effect, kAllEffects)),
+          m_instance(m_effect) {
         options.settings.Apply(m_instance);
         for (const std::string& animation : options.animations) {
             m_instance.Animate(animation, options.easing);
@@ -136,7 +137,7 @@ private:
 
     const RenderOptions& m_options;
     const EffectDescriptor& m_effect;
-    CInstance m_instance;
+    CClipInstance m_instance;
     std::vector<Source> m_sources;
     FrameShape m_shape;
 };
@@ -461,7 +462,7 @@ SoundJoin CRendering::JoinedSound(const Timeline& timeline, const Rational& rate
 
 } // namespace
 
-void EffectSettings::Apply(CInstance& instance) const {
+void EffectSettings::Apply(CClipInstance& instance) const {
     EffectContext& context = instance.Context();
     for (const std::string& assignment : sets) {
         instance.Set(assignment);

@@ -8,9 +8,9 @@
 #include <vector>
 
 #include "host/Arguments.h"
+#include "host/ClipInstance.h"
+#include "host/Easing.h"
 #include "host/Video.h"
-#include "hosting/Easing.h"
-#include "hosting/Instance.h"
 
 namespace kyvhost {
 
@@ -32,7 +32,7 @@ struct EffectSettings {
     bool firstField = false, secondField = false;
 
     // Throws CUsageError.
-    void Apply(CInstance& instance) const;
+    void Apply(CClipInstance& instance) const;
 };
 
 struct RenderOptions {

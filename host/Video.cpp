@@ -8,8 +8,8 @@
 
 #include <nlohmann/json.hpp>
 
+#include "host/ExitStatus.h"
 #include "host/Ffmpeg.h"
-#include "hosting/ExitStatus.h"
 #include "hosting/Text.h"
 
 namespace kyvhost {

@@ -5,7 +5,7 @@
 #include <cstdio>
 #include <string>
 
-namespace kyvhost {
+namespace kyvhosting {
 
 // 0x80004005
 inline std::string Hex(uint32_t status) {
@@ -14,4 +14,4 @@ inline std::string Hex(uint32_t status) {
     return text;
 }
 
-} // namespace kyvhost
+} // namespace kyvhosting

@@ -1,96 +1,81 @@
 // One instance of an effect, with everything that a host owns: the context, the instance data and
-// the parameter buffer; and the calling order.
+// the parameter buffer.
+//
+// The calls hand on the callbacks' statuses as they are and throw nothing; Require turns a status
+// into an exception where that suits better. Two calls of one instance must not run at the same
+// time; the caller has the lock.
 #pragma once
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
-#include "hosting/Easing.h"
 #include "interface/HostInterface.h"
 
-namespace kyvhost {
-
-// A frame has rows of frameWidth pixels: two views of half of it when sideBySide.
-struct FrameShape {
-    uint32_t frameWidth = 0;
-    uint32_t height = 0;
-    bool sideBySide = false;
-
-    size_t Pixels() const { return size_t{frameWidth} * height; }
-    size_t Bytes() const { return Pixels() * 4; }
-};
-
-// A parameter that changes over the clip.
-struct Animation {
-    uint32_t index;
-    std::vector<uint8_t> from, to;
-    Easing easing;
-};
+namespace kyvhosting {
 
 class CInstance {
 public:
-    // Calls InitInstance, which writes the defaults. Throws CHostError on any status but success,
-    // as do all calls below.
+    // Fills the context in as far as it follows from the effect and leaves the rest zero: one
+    // thread, the scalar level, an ARGB frame. Calls nothing.
     explicit CInstance(const EffectDescriptor& effect);
-    ~CInstance(); // EndProcessing if begun, and DestroyInstance
+
+    // EndProcessing when begun and not ended, DestroyInstance when initialised and not destroyed.
+    ~CInstance();
 
     CInstance(const CInstance&) = delete;
     CInstance& operator=(const CInstance&) = delete;
 
-    const EffectDescriptor& Effect() const { return m_effect; }
+    const EffectDescriptor& Effect() const { return *m_context.descriptor; }
 
-    // The context, for what does not follow from the calls below: levels, threads, preview.
+    // The context, for the size of a view, time, level, threads and everything else. Its pointers
+    // to descriptor, instance data and parameters are the instance's.
     EffectContext& Context() { return m_context; }
+    const EffectContext& Context() const { return m_context; }
 
-    // The current value of a parameter: valueSize bytes in the buffer.
+    // The callbacks. Init writes the defaults to the parameter buffer.
+    KyvStatus Init();
+    KyvStatus Begin();
+    KyvStatus SetInput(uint32_t index, const void* frame);
+    KyvStatus Process(void* output);
+    KyvStatus End();
+    KyvStatus Destroy();
+
+    // SetInput for each of the effect's inputs and Process, up to the first that fails. The frames
+    // hold what the context says; input1 is for effects with two.
+    KyvStatus Render(void* output, const void* input0, const void* input1 = nullptr);
+
+    // The current value of a parameter: valueSize bytes in the buffer, not aligned.
     const uint8_t* Value(uint32_t index) const { return m_params.data() + m_offsets[index]; }
     uint8_t* Value(uint32_t index) { return m_params.data() + m_offsets[index]; }
 
-    // "P3=0.8" or "Degree=0.8". Throws CUsageError.
-    void Set(std::string_view assignment);
+    // The whole buffer: the values in table order without gaps.
+    std::vector<uint8_t>& Params() { return m_params; }
 
-    // "P1=0:1", or "P1=0:1:in-out" with an easing of its own. Throws CUsageError.
-    void Animate(std::string_view assignment, Easing easing);
+    // The index of a key such as "P1"; nothing when there is none.
+    std::optional<uint32_t> IndexOf(std::string_view key) const;
 
-    // Whether a value of the parameter has been given by Set or Animate.
-    bool IsGiven(uint32_t index) const { return m_given[index]; }
-
-    bool IsAnimated() const { return !m_animations.empty(); }
-
-    // Gives every animated parameter its value for a fraction 0..1 of the clip.
-    void ApplyAnimations(double fraction);
-
-    // Sets size and layout and calls BeginProcessing.
-    void Begin(const FrameShape& shape);
-
-    // SetInputFrame for every input and ProcessFrame, per view of the shape and per field. The
-    // fields: FieldSelector_Frame, or a set of rows to render while the others show the input.
-    // frameNumber counts from 0 and only serves messages.
-    void Render(const uint8_t* const inputs[2], uint8_t* output, int64_t frameNumber);
-
-    // For Render; both fields are two calls a frame.
-    void SetFields(bool first, bool second) {
-        m_bFirstField = first;
-        m_bSecondField = second;
+    // Stores a value under its key. False, and nothing is stored, when there is no such key or
+    // the value's size is not the declared one.
+    template <class T>
+    bool Set(std::string_view key, const T& value) {
+        return SetBytes(key, &value, sizeof value);
     }
+    bool SetBytes(std::string_view key, const void* value, size_t size);
 
 private:
-    void RenderRows(const uint8_t* const inputs[2], uint8_t* output, int64_t frameNumber);
-
-    const EffectDescriptor& m_effect;
     EffectContext m_context = {};
-    std::unique_ptr<uint64_t[]> m_data; // aligned for any member
+    std::unique_ptr<uint64_t[]> m_data; // aligned as an allocator aligns
     std::vector<size_t> m_offsets;      // of each parameter in the buffer
     std::vector<uint8_t> m_params;
-    std::vector<bool> m_given;
-    std::vector<Animation> m_animations;
-    FrameShape m_shape;
+    bool m_bInitialised = false;
     bool m_bBegun = false;
-    bool m_bFirstField = false;
-    bool m_bSecondField = false;
 };
 
-} // namespace kyvhost
+// Throws CCallError "IDENTIFIER: CALL failed with status 0x..." for any status but success.
+void Require(KyvStatus status, const EffectDescriptor& effect, const std::string& call);
+
+} // namespace kyvhosting

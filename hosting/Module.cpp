@@ -3,19 +3,18 @@
 
 #include <memory>
 
-#include "hosting/ExitStatus.h"
+#include "hosting/Error.h"
 #include "hosting/Hex.h"
 #include "hosting/Text.h"
 #include "platform/Library.h"
-#include "platform/Process.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 namespace {
 
 namespace fs = std::filesystem;
 
 [[noreturn]] void Fail(const std::string& text) {
-    throw CHostError(ExitStatus::ModuleNotUsable, text);
+    throw CModuleError(text);
 }
 
 template <class Function>
@@ -29,17 +28,15 @@ Function FindExport(KyvModuleHandle library, const char* name, const fs::path& f
 
 } // namespace
 
-fs::path DefaultModuleFile() {
-    const fs::path folder = kyv::ExecutableFile().parent_path();
-    for (const fs::path& place : {folder, folder / "../module", folder / "../lib"}) {
-        const fs::path file = place / KYV_MODULE_NAME;
+fs::path FindModuleFile(const std::vector<fs::path>& folders) {
+    for (const fs::path& folder : folders) {
+        const fs::path file = folder / KYV_MODULE_NAME;
         std::error_code error;
         if (fs::exists(file, error)) {
             return file.lexically_normal();
         }
     }
-    Fail("no " KYV_MODULE_NAME " beside " + TextOf(folder / "kyvhost") +
-         "; name the module with --module FILE");
+    return {};
 }
 
 CModule::CModule(const fs::path& file) : m_file(fs::absolute(file).lexically_normal()) {
@@ -98,4 +95,4 @@ void CModule::Check() const {
     }
 }
 
-} // namespace kyvhost
+} // namespace kyvhosting

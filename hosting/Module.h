@@ -2,17 +2,22 @@
 #pragma once
 
 #include <filesystem>
+#include <vector>
 
 #include "interface/HostInterface.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 
-// Where the module lies when the user names none: beside the program, else where the build tree
-// and an installation have it. Throws CHostError when it is in none of these places.
-std::filesystem::path DefaultModuleFile();
+// The module's file in the first of the folders that has it; empty when none does.
+std::filesystem::path FindModuleFile(const std::vector<std::filesystem::path>& folders);
 
-// A loaded and initialised module. Throws CHostError with ModuleNotUsable when the file is missing
-// or no library, lacks an export, refuses to start, or speaks another format number.
+// A loaded and initialised module. Throws CModuleError when the file is missing or no library,
+// lacks an export, refuses to start, speaks another format number or has records without names or
+// callbacks.
+//
+// A program may load the same file any number of times: all get the same descriptor. The first
+// that goes takes the texts of the language library away from the others, so whoever shares a
+// process with other hosts of the module keeps theirs.
 class CModule {
 public:
     explicit CModule(const std::filesystem::path& file);
@@ -33,4 +38,4 @@ private:
     ModuleDescriptor* m_pDescriptor = nullptr;
 };
 
-} // namespace kyvhost
+} // namespace kyvhosting

@@ -4,13 +4,13 @@
 #include <algorithm>
 #include <charconv>
 
-#include "hosting/ExitStatus.h"
+#include "hosting/Error.h"
 #include "hosting/Suggest.h"
 #include "hosting/Text.h"
 #include "interface/LanguageLibrary.h"
 #include "platform/Library.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 namespace {
 
 bool IsUpper(char c) {
@@ -56,8 +56,10 @@ bool IsPart(std::string_view text, std::string_view name) {
 
 // The end of "no effect x": the nearest name, if one is near, and where all are.
 std::string WithNearest(const std::string& nearest, const std::string& where) {
-    return nearest.empty() ? "; " + where
-                           : "; the nearest is " + Quoted(nearest) + " (" + where + ")";
+    if (nearest.empty()) {
+        return where.empty() ? "" : "; " + where;
+    }
+    return "; the nearest is " + Quoted(nearest) + (where.empty() ? "" : " (" + where + ")");
 }
 
 std::string_view WithoutLabels(std::string_view nameKey) {
@@ -177,7 +179,17 @@ std::string Normalized(std::string_view text) {
     return normal;
 }
 
-const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text) {
+const EffectDescriptor* EffectOf(const ModuleDescriptor& module, std::string_view identifier) {
+    const EffectDescriptor* const end = module.effects + module.effectCount;
+    const auto* const found =
+        std::find_if(module.effects, end, [identifier](const EffectDescriptor& effect) {
+            return effect.identifier == identifier;
+        });
+    return found == end ? nullptr : found;
+}
+
+const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text,
+                                   const std::string& where) {
     if (IsWholeNumber(text)) {
         uint32_t index = 0;
         const char* const end = text.data() + text.size();
@@ -210,11 +222,11 @@ const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_v
     if (parts.size() > 1) {
         throw CUsageError("several effects are called " + Quoted(text) + ": " + Join(parts, ", "));
     }
-    throw CUsageError("no effect " + Quoted(text) +
-                      WithNearest(Nearest(text, names), "kyvhost list shows all"));
+    throw CUsageError("no effect " + Quoted(text) + WithNearest(Nearest(text, names), where));
 }
 
-uint32_t FindParam(const EffectDescriptor& effect, std::string_view text) {
+uint32_t FindParam(const EffectDescriptor& effect, std::string_view text,
+                   const std::string& where) {
     struct Candidates {
         uint32_t last = 0;
         std::vector<std::string> keys;
@@ -253,9 +265,8 @@ uint32_t FindParam(const EffectDescriptor& effect, std::string_view text) {
     if (names.empty()) {
         throw CUsageError(ShortName(effect) + " has no parameters");
     }
-    throw CUsageError(
-        ShortName(effect) + " has no parameter " + Quoted(text) +
-        WithNearest(Nearest(text, names), "kyvhost info " + ShortName(effect) + " shows all"));
+    throw CUsageError(ShortName(effect) + " has no parameter " + Quoted(text) +
+                      WithNearest(Nearest(text, names), where));
 }
 
-} // namespace kyvhost
+} // namespace kyvhosting

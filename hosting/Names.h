@@ -13,7 +13,7 @@
 
 #include "interface/HostInterface.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 
 // The text of a key in the module's language library; empty when there is none.
 std::string LanguageText(const EffectDescriptor& effect, const char* key);
@@ -41,11 +41,16 @@ std::vector<std::string> ChoiceNames(const EffectDescriptor& effect, const Param
 std::string Normalized(std::string_view text);
 
 // By identifier, index, name, short name or a part of a name that no other effect has. Throws
-// CUsageError with the nearest name.
-const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text);
+// CUsageError with the nearest name; where tells in it where all are shown ("list shows all").
+const EffectDescriptor& FindEffect(const ModuleDescriptor& module, std::string_view text,
+                                   const std::string& where = {});
+
+// By identifier alone; null when there is none.
+const EffectDescriptor* EffectOf(const ModuleDescriptor& module, std::string_view identifier);
 
 // The index by key, name or a part of a name that no other parameter has. Throws CUsageError with
 // the nearest one, or with the keys among which a name leaves the choice.
-uint32_t FindParam(const EffectDescriptor& effect, std::string_view text);
+uint32_t FindParam(const EffectDescriptor& effect, std::string_view text,
+                   const std::string& where = {});
 
-} // namespace kyvhost
+} // namespace kyvhosting

@@ -5,7 +5,7 @@
 
 #include "hosting/Names.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 
 size_t EditDistance(std::string_view a, std::string_view b) {
     // Three rows of the usual table; a swap looks two rows back.
@@ -53,4 +53,4 @@ std::string Nearest(std::string_view text, const std::vector<std::string>& candi
     return nearest;
 }
 
-} // namespace kyvhost
+} // namespace kyvhosting

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <vector>
 
-namespace kyvhost {
+namespace kyvhosting {
 
 // The number of letters to insert, delete, change or swap with their neighbour.
 size_t EditDistance(std::string_view a, std::string_view b);
@@ -14,4 +14,4 @@ size_t EditDistance(std::string_view a, std::string_view b);
 // first of several, empty when none is near.
 std::string Nearest(std::string_view text, const std::vector<std::string>& candidates);
 
-} // namespace kyvhost
+} // namespace kyvhosting

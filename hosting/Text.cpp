@@ -1,7 +1,7 @@
 // Small helpers for text.
 #include "hosting/Text.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 
 bool IsWholeNumber(std::string_view text) {
     if (text.starts_with('-') || text.starts_with('+')) {
@@ -41,4 +41,4 @@ std::string Join(const std::vector<std::string>& parts, std::string_view separat
     return text;
 }
 
-} // namespace kyvhost
+} // namespace kyvhosting

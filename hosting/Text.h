@@ -1,4 +1,4 @@
-// Small helpers for UTF-8 text, which is what every string of the host holds.
+// Small helpers for UTF-8 text, which is what every string of a host holds.
 #pragma once
 
 #include <filesystem>
@@ -6,7 +6,7 @@
 #include <string_view>
 #include <vector>
 
-namespace kyvhost {
+namespace kyvhosting {
 
 inline std::filesystem::path PathOf(std::string_view text) {
     return std::filesystem::path(std::u8string(text.begin(), text.end()));
@@ -32,4 +32,4 @@ std::vector<std::string> Split(std::string_view text, char separator);
 
 std::string Join(const std::vector<std::string>& parts, std::string_view separator);
 
-} // namespace kyvhost
+} // namespace kyvhosting

@@ -1,17 +1,18 @@
-// Parameter values as text.
+// Parameter values.
 #include "hosting/Values.h"
 
+#include <algorithm>
 #include <cfloat>
 #include <charconv>
 #include <cmath>
 #include <cstring>
 #include <optional>
 
-#include "hosting/ExitStatus.h"
+#include "hosting/Error.h"
 #include "hosting/Names.h"
 #include "hosting/Text.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 namespace {
 
 template <class T>
@@ -46,13 +47,9 @@ std::string FormatFloat(double number) {
     return std::string(text, end);
 }
 
-bool IsWhole(const ParamDescriptor& param) {
-    return param.type == ParamType_Byte || param.type == ParamType_Int ||
-           param.type == ParamType_Choice;
-}
-
 bool IsNumber(const ParamDescriptor& param) {
-    return IsWhole(param) || param.type == ParamType_Float;
+    return param.type == ParamType_Byte || param.type == ParamType_Int ||
+           param.type == ParamType_Choice || param.type == ParamType_Float;
 }
 
 // Floats of a compound value.
@@ -102,6 +99,22 @@ void StoreNumber(const ParamDescriptor& param, double number, void* value) {
         Store(value, static_cast<uint8_t>(number));
     } else {
         Store(value, static_cast<int32_t>(number));
+    }
+}
+
+// All that a value of the type can be.
+NumberRange RangeOfType(const ParamDescriptor& param) {
+    switch (param.type) {
+    case ParamType_Bool:
+        return {0, HasThirdMode(param) ? 2.0 : 1.0};
+    case ParamType_Byte:
+    case ParamType_Color:
+        return {0, 255};
+    case ParamType_Choice:
+    case ParamType_Int:
+        return {INT32_MIN, INT32_MAX};
+    default:
+        return {-FLT_MAX, FLT_MAX};
     }
 }
 
@@ -268,6 +281,47 @@ double NumberOf(const ParamDescriptor& param, const void* value) {
     }
 }
 
+bool IsWhole(const ParamDescriptor& param) {
+    return IsKnownType(param) && param.type != ParamType_Float && FloatCount(param) == 0;
+}
+
+NumberRange RangeOf(const ParamDescriptor& param) {
+    if (!HasRange(param)) {
+        return RangeOfType(param);
+    }
+    return {NumberOf(param, param.minimum), NumberOf(param, param.maximum)};
+}
+
+size_t ComponentCount(const ParamDescriptor& param) {
+    if (!IsKnownType(param)) {
+        return 0;
+    }
+    return param.type == ParamType_Color ? 3 : std::max<size_t>(FloatCount(param), 1);
+}
+
+double ComponentOf(const ParamDescriptor& param, const void* value, size_t component) {
+    if (param.type == ParamType_Color) {
+        return Load<uint8_t>(value, component);
+    }
+    return FloatCount(param) ? double{Load<float>(value, component)} : NumberOf(param, value);
+}
+
+void SetComponent(const ParamDescriptor& param, void* value, size_t component, double number) {
+    if (!std::isfinite(number)) {
+        number = param.defaultValue ? ComponentOf(param, param.defaultValue, component) : 0;
+    }
+    const NumberRange range = RangeOf(param);
+    number = std::clamp(number, range.least, range.most);
+    number = IsWhole(param) ? std::round(number) : number;
+    if (param.type == ParamType_Color) {
+        Store(value, static_cast<uint8_t>(number), component);
+    } else if (FloatCount(param)) {
+        Store(value, static_cast<float>(number), component);
+    } else {
+        StoreNumber(param, number, value);
+    }
+}
+
 std::string FormatValue(const ParamDescriptor& param, const void* value) {
     if (!IsKnownType(param)) {
         std::string bytes;
@@ -327,15 +381,8 @@ void ParseValue(const ParamDescriptor& param, std::string_view name, std::string
     if (!number) {
         throw CUsageError(std::string(name) + ": " + Quoted(text) + " is not " + Wanted(param));
     }
-    const double least = HasRange(param)                 ? NumberOf(param, param.minimum)
-                         : param.type == ParamType_Byte  ? 0
-                         : param.type == ParamType_Float ? -FLT_MAX
-                                                         : INT32_MIN;
-    const double most = HasRange(param)                 ? NumberOf(param, param.maximum)
-                        : param.type == ParamType_Byte  ? 255
-                        : param.type == ParamType_Float ? FLT_MAX
-                                                        : INT32_MAX;
-    if (*number < least || *number > most) {
+    const NumberRange range = RangeOf(param);
+    if (*number < range.least || *number > range.most) {
         throw CUsageError(std::string(name) + ": " + std::string(text) +
                           " is out of range: " + RangeText(param));
     }
@@ -368,4 +415,4 @@ void Interpolate(const ParamDescriptor& param, const void* from, const void* to,
     }
 }
 
-} // namespace kyvhost
+} // namespace kyvhosting

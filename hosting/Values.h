@@ -1,6 +1,8 @@
-// Parameter values as text: parsing, formatting, ranges and the way from one value to another.
+// Parameter values: as numbers, as text, and the way from one value to another.
 //
-// A value is valueSize bytes as the parameter buffer holds them. The text forms are
+// A value is valueSize bytes as the parameter buffer holds them. As numbers it has components: one,
+// two for a position (x, y), four for a mask rectangle (left, top, right, bottom), three for a
+// colour (red, green, blue, 0 to 255). The text forms are
 //   numbers         0.25, -3
 //   switches        on, off (also true, false, yes, no, 1, 0)
 //   choices         a label or its index
@@ -15,7 +17,7 @@
 
 #include "interface/HostInterface.h"
 
-namespace kyvhost {
+namespace kyvhosting {
 
 // Whether type and size of the record agree, so that its values can be read and set.
 bool IsKnownType(const ParamDescriptor& param);
@@ -32,6 +34,26 @@ bool HasRange(const ParamDescriptor& param);
 // A number as the record's minimum, maximum or any other value of a number type.
 double NumberOf(const ParamDescriptor& param, const void* value);
 
+// Whether the value is whole numbers: all types but floats, rectangles and positions.
+bool IsWhole(const ParamDescriptor& param);
+
+struct NumberRange {
+    double least, most;
+};
+
+// What every component lies between: the record's bounds where HasRange, else all that the type
+// holds. A switch has 0 and 1; the one that shows a comparison has 2 as well, side by side.
+NumberRange RangeOf(const ParamDescriptor& param);
+
+// 1 to 4; 0 for a type that is not known.
+size_t ComponentCount(const ParamDescriptor& param);
+
+double ComponentOf(const ParamDescriptor& param, const void* value, size_t component);
+
+// Any number at all may come: one that is not finite counts as the default's, the others are
+// clamped to the range, whole numbers are rounded to the nearest.
+void SetComponent(const ParamDescriptor& param, void* value, size_t component, double number);
+
 // The shortest text that ParseValue turns into the same bytes.
 std::string FormatValue(const ParamDescriptor& param, const void* value);
 
@@ -46,4 +68,4 @@ bool CanAnimate(const ParamDescriptor& param);
 void Interpolate(const ParamDescriptor& param, const void* from, const void* to, double fraction,
                  void* value);
 
-} // namespace kyvhost
+} // namespace kyvhosting

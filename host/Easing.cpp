@@ -1,11 +1,11 @@
 // Easing curves.
-#include "hosting/Easing.h"
+#include "host/Easing.h"
 
 #include <algorithm>
 #include <array>
 #include <string>
 
-#include "hosting/ExitStatus.h"
+#include "host/ExitStatus.h"
 #include "hosting/Text.h"
 
 namespace kyvhost {

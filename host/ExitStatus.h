@@ -4,12 +4,15 @@
 #include <stdexcept>
 #include <string>
 
+#include "host/Hosting.h"
+#include "hosting/Error.h"
+
 namespace kyvhost {
 
 enum class ExitStatus {
     Done = 0,
     RenderingFailed = 1, // the module or the writing of the result failed
-    WrongUse = 2,        // options, names and values
+    WrongUse = 2,        // options, names and values: CUsageError
     InputUnreadable = 3, // a missing or broken picture or video
     ModuleNotUsable = 4, // not there, no library, exports missing, another format number
     Interrupted = 130,
@@ -25,12 +28,6 @@ public:
 
 private:
     ExitStatus m_status;
-};
-
-// The most frequent kind.
-class CUsageError : public CHostError {
-public:
-    explicit CUsageError(const std::string& text) : CHostError(ExitStatus::WrongUse, text) {}
 };
 
 } // namespace kyvhost
