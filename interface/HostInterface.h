@@ -18,8 +18,9 @@
 // module keeps what it allocates in the instance data and gives it back in EndProcessing and
 // DestroyInstance.
 //
-// Threads: the callbacks take no lock. Two callbacks of one instance must not run at the same
-// time; different instances may run on different threads. Callbacks never throw.
+// Threads: the two exports may be called from any thread. The callbacks take no lock. Two callbacks
+// of one instance must not run at the same time; different instances may run on different threads.
+// Callbacks never throw.
 //
 // Frames: 32 bits a pixel, rows top down and contiguous, no padding. In memory a pixel is B, G, R,
 // A (ARGB frames, straight alpha, full range) or V, U, Y, A (AYUV frames, BT.601 studio range: Y

@@ -1,9 +1,18 @@
 // The two functions that the library exports.
+#include <mutex>
+
 #include "interface/HostInterface.h"
 #include "module/Module.h"
 #include "module/ResourceLibrary.h"
 
 using kyv::g_module;
+
+namespace {
+
+// Several hosts may share a process, plug-ins of one program say, and start at the same time.
+std::mutex g_mutex;
+
+} // namespace
 
 extern "C" {
 
@@ -15,6 +24,7 @@ KYV_DSP_InitModule(ModuleDescriptor** descriptor) noexcept {
         return KYV_FAIL;
     }
     *descriptor = &g_module;
+    const std::lock_guard lock(g_mutex);
     try {
         if (const auto found = kyv::FindResourceLibrary(g_module.ModuleHandle)) {
             g_module.ResourceLibrary = *found;
@@ -29,6 +39,7 @@ KYV_DSP_InitModule(ModuleDescriptor** descriptor) noexcept {
 }
 
 [[gnu::visibility("default")]] KyvStatus KYV_DSP_DeInitModule(void) noexcept {
+    const std::lock_guard lock(g_mutex);
     if (g_module.ResourceLibrary != g_module.ModuleHandle) {
         kyv::CloseLibrary(g_module.ResourceLibrary);
     }
