@@ -22,6 +22,10 @@ LibraryHandle OwnLibrary();
 // cut off beyond. Empty when the handle is unknown.
 NativeString LibraryFileName(LibraryHandle library);
 
+// The file of the library or the program that holds an address of code, as the system tells it.
+// Empty when the address belongs to none.
+NativeString FileNameOfCode(const void* address);
+
 // Three letters such as ENU, DEU or JPN for the user's language and country. On Linux it is taken
 // from LC_ALL, LC_MESSAGES or LANG, whichever is set first; ENU when none is, or for "C".
 NativeString AbbreviatedLanguageName();

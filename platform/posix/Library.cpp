@@ -87,6 +87,11 @@ NativeString LibraryFileName(LibraryHandle library) {
     return path;
 }
 
+NativeString FileNameOfCode(const void* address) {
+    Dl_info info;
+    return address && dladdr(address, &info) && info.dli_fname ? info.dli_fname : "";
+}
+
 NativeString AbbreviatedLanguageName() {
     std::string_view locale = UserLocale();
     locale = locale.substr(0, locale.find_first_of(".@")); // codeset and modifier

@@ -19,6 +19,16 @@ NativeString LibraryFileName(LibraryHandle library) {
     return NativeString(path, length < kMaxPathUnits ? length : kMaxPathUnits - 1);
 }
 
+NativeString FileNameOfCode(const void* address) {
+    HMODULE library = nullptr;
+    const DWORD flags =
+        GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT;
+    if (!address || !GetModuleHandleExW(flags, static_cast<LPCWSTR>(address), &library)) {
+        return {};
+    }
+    return LibraryFileName(library);
+}
+
 NativeString AbbreviatedLanguageName() {
     wchar_t name[8];
     const int length = GetLocaleInfoW(LOCALE_USER_DEFAULT, LOCALE_SABBREVLANGNAME, name, 8);
