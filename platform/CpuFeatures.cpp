@@ -1,10 +1,11 @@
-// Reads the processor's features once; the compiler's support library knows how on both targets.
+// Reads the processor's features once; the compiler's support library knows how on both systems.
 #include "platform/CpuFeatures.h"
 
 namespace kyv {
 namespace {
 
 ProcessorFeatures Detect() {
+#ifdef __x86_64__
     __builtin_cpu_init();
     // The checks include the operating system's support for the wide registers.
     return {.ssse3 = __builtin_cpu_supports("ssse3") != 0,
@@ -13,6 +14,9 @@ ProcessorFeatures Detect() {
             .avx512bw = __builtin_cpu_supports("avx512bw") != 0,
             .avx512dq = __builtin_cpu_supports("avx512dq") != 0,
             .avx512vl = __builtin_cpu_supports("avx512vl") != 0};
+#else
+    return {};
+#endif
 }
 
 } // namespace

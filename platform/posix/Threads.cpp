@@ -69,13 +69,44 @@ const CodeRange& OwnCode() {
     return range;
 }
 
+// Where a thread that was stopped by a signal runs, and where its stack ends.
+#ifdef __aarch64__
+uintptr_t Place(const mcontext_t& machine) {
+    return machine.pc;
+}
+uintptr_t Stack(const mcontext_t& machine) {
+    return machine.sp;
+}
+#else
+uintptr_t Place(const mcontext_t& machine) {
+    return static_cast<uintptr_t>(machine.gregs[REG_RIP]);
+}
+uintptr_t Stack(const mcontext_t& machine) {
+    return static_cast<uintptr_t>(machine.gregs[REG_RSP]);
+}
+#endif
+
+// True when the signal reaches a thread. An emulator keeps some for itself, which the process may
+// claim but not send; one is sent to this thread, which blocks it meanwhile and takes it back.
+bool CanBeSent(int number) {
+    sigset_t only, previous;
+    sigemptyset(&only);
+    sigaddset(&only, number);
+    pthread_sigmask(SIG_BLOCK, &only, &previous);
+    const timespec atOnce = {};
+    const bool sent = pthread_sigqueue(pthread_self(), number, {}) == 0 &&
+                      sigtimedwait(&only, nullptr, &atOnce) == number;
+    pthread_sigmask(SIG_SETMASK, &previous, nullptr);
+    return sent;
+}
+
 // The signal that stops a thread to be terminated: the highest that nobody has claimed.
 int StopSignal() {
     static const int chosen = [] {
         for (int number = SIGRTMAX; number > SIGRTMIN; --number) {
             struct sigaction action;
             if (sigaction(number, nullptr, &action) == 0 && !(action.sa_flags & SA_SIGINFO) &&
-                action.sa_handler == SIG_DFL) {
+                action.sa_handler == SIG_DFL && CanBeSent(number)) {
                 return number;
             }
         }
@@ -196,14 +227,13 @@ struct CThread::State {
         }
         const int savedErrno = errno;
         auto* self = static_cast<State*>(info->si_value.sival_ptr);
-        const auto& registers = static_cast<ucontext_t*>(context)->uc_mcontext.gregs;
-        const auto place = static_cast<uintptr_t>(registers[REG_RIP]);
-        if (self->inside && (self->force || self->ownCode.Contains(place))) {
+        const mcontext_t& machine = static_cast<ucontext_t*>(context)->uc_mcontext;
+        if (self->inside && (self->force || self->ownCode.Contains(Place(machine)))) {
             self->inside = false;
             siglongjmp(self->leave, 1);
         }
-        self->place = place;
-        self->stack = static_cast<uintptr_t>(registers[REG_RSP]);
+        self->place = Place(machine);
+        self->stack = Stack(machine);
         self->looked.Set();
         errno = savedErrno;
     }
