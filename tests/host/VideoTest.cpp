@@ -212,7 +212,9 @@ TEST_F(VideoTest, ErrorsLeaveNothing) {
     const Case cases[] = {
         {{"text.mp4", out}, 3, "text.mp4"},
         {{"cut.mkv", out}, 3, "cut.mkv"},
+#ifndef KYV_EMULATED // which does not tell that a program could not be started
         {{"in.mkv", out, "--ffmpeg", "/none/ffmpeg"}, 2, "--ffmpeg: \"/none/ffmpeg\""},
+#endif
         {{"in.mkv", out, "--overlap", "1"}, 2, "and probe takes one input"},
         {{"in.mkv", Path("out.mp4"), "--codec", "ffv1"}, 2, ".mkv"},
         {{"in.mkv", out, "--start", "1m"}, 2, "\"1m\""},
