@@ -37,10 +37,6 @@ void RippleOffsetRow_scalar(float* offsets, size_t count, int32_t dy, const Ripp
     }
 }
 
-constinit const KernelTable<RippleOffsetRow> kRippleOffsetRow = {
-    .scalar = RippleOffsetRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(RippleOffsetRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(RippleOffsetRow_avx2),
-};
+constinit const KernelTable<RippleOffsetRow> kRippleOffsetRow = {KYV_TABLE(RippleOffsetRow)};
 
 } // namespace kyv

@@ -22,9 +22,7 @@ struct RippleShape {
 using RippleOffsetRow = void (*)(float* offsets, size_t count, int32_t dy,
                                  const RippleShape& shape);
 
-void RippleOffsetRow_scalar(float* offsets, size_t count, int32_t dy, const RippleShape& shape);
-void RippleOffsetRow_sse2(float* offsets, size_t count, int32_t dy, const RippleShape& shape);
-void RippleOffsetRow_avx2(float* offsets, size_t count, int32_t dy, const RippleShape& shape);
+KYV_FORMS(RippleOffsetRow, RippleOffsetRow)
 
 extern const KernelTable<RippleOffsetRow> kRippleOffsetRow;
 

@@ -42,10 +42,6 @@ void RippleSampleRow_scalar(uint8_t* dst, const RipplePicture& picture, int32_t 
     }
 }
 
-constinit const KernelTable<RippleSampleRow> kRippleSampleRow = {
-    .scalar = RippleSampleRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(RippleSampleRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(RippleSampleRow_avx2),
-};
+constinit const KernelTable<RippleSampleRow> kRippleSampleRow = {KYV_TABLE(RippleSampleRow)};
 
 } // namespace kyv

@@ -22,12 +22,7 @@ struct RipplePicture {
 using RippleSampleRow = void (*)(uint8_t* dst, const RipplePicture& picture, int32_t x, int32_t y,
                                  const float* offsets, size_t count);
 
-void RippleSampleRow_scalar(uint8_t* dst, const RipplePicture& picture, int32_t x, int32_t y,
-                            const float* offsets, size_t count);
-void RippleSampleRow_sse2(uint8_t* dst, const RipplePicture& picture, int32_t x, int32_t y,
-                          const float* offsets, size_t count);
-void RippleSampleRow_avx2(uint8_t* dst, const RipplePicture& picture, int32_t x, int32_t y,
-                          const float* offsets, size_t count);
+KYV_FORMS(RippleSampleRow, RippleSampleRow)
 
 extern const KernelTable<RippleSampleRow> kRippleSampleRow;
 

@@ -47,15 +47,8 @@ void GradientRow_scalar(uint8_t* pixels, const float* top, const float* rise, si
     }
 }
 
-constinit const KernelTable<ColorKeyRow> kColorKeyRow = {
-    .scalar = ColorKeyRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(ColorKeyRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(ColorKeyRow_avx2),
-};
+constinit const KernelTable<ColorKeyRow> kColorKeyRow = {KYV_TABLE(ColorKeyRow)};
 
-constinit const KernelTable<GradientRow> kGradientRow = {
-    .scalar = GradientRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(GradientRow_sse2),
-};
+constinit const KernelTable<GradientRow> kGradientRow = {KYV_TABLE(GradientRow)};
 
 } // namespace kyv

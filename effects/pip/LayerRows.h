@@ -17,12 +17,7 @@ namespace kyv {
 using ColorKeyRow = void (*)(uint8_t* pixels, const uint8_t* below, size_t count, uint32_t key,
                              uint8_t tolerance);
 
-void ColorKeyRow_scalar(uint8_t* pixels, const uint8_t* below, size_t count, uint32_t key,
-                        uint8_t tolerance);
-void ColorKeyRow_sse2(uint8_t* pixels, const uint8_t* below, size_t count, uint32_t key,
-                      uint8_t tolerance);
-void ColorKeyRow_avx2(uint8_t* pixels, const uint8_t* below, size_t count, uint32_t key,
-                      uint8_t tolerance);
+KYV_FORMS(ColorKeyRow, ColorKeyRow)
 
 extern const KernelTable<ColorKeyRow> kColorKeyRow;
 
@@ -32,10 +27,7 @@ extern const KernelTable<ColorKeyRow> kColorKeyRow;
 using GradientRow = void (*)(uint8_t* pixels, const float* top, const float* rise, size_t count,
                              float part);
 
-void GradientRow_scalar(uint8_t* pixels, const float* top, const float* rise, size_t count,
-                        float part);
-void GradientRow_sse2(uint8_t* pixels, const float* top, const float* rise, size_t count,
-                      float part);
+KYV_FORMS(GradientRow, GradientRow)
 
 extern const KernelTable<GradientRow> kGradientRow;
 

@@ -28,10 +28,6 @@ void QuadMapRow_scalar(uint32_t* map, int32_t x, size_t count, const QuadMapRowP
     }
 }
 
-constinit const KernelTable<QuadMapRow> kQuadMapRow = {
-    .scalar = QuadMapRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(QuadMapRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(QuadMapRow_avx2),
-};
+constinit const KernelTable<QuadMapRow> kQuadMapRow = {KYV_TABLE(QuadMapRow)};
 
 } // namespace kyv

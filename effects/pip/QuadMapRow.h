@@ -44,9 +44,7 @@ struct QuadMapRowPlan {
 // position times 64, truncated and wrapped.
 using QuadMapRow = void (*)(uint32_t* map, int32_t x, size_t count, const QuadMapRowPlan& plan);
 
-void QuadMapRow_scalar(uint32_t* map, int32_t x, size_t count, const QuadMapRowPlan& plan);
-void QuadMapRow_sse2(uint32_t* map, int32_t x, size_t count, const QuadMapRowPlan& plan);
-void QuadMapRow_avx2(uint32_t* map, int32_t x, size_t count, const QuadMapRowPlan& plan);
+KYV_FORMS(QuadMapRow, QuadMapRow)
 
 extern const KernelTable<QuadMapRow> kQuadMapRow;
 

@@ -26,10 +26,6 @@ void QuadSampleRow_scalar(uint8_t* dst, const uint32_t* map, size_t count,
     }
 }
 
-constinit const KernelTable<QuadSampleRow> kQuadSampleRow = {
-    .scalar = QuadSampleRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(QuadSampleRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(QuadSampleRow_avx2),
-};
+constinit const KernelTable<QuadSampleRow> kQuadSampleRow = {KYV_TABLE(QuadSampleRow)};
 
 } // namespace kyv

@@ -25,12 +25,7 @@ struct SamplePicture {
 using QuadSampleRow = void (*)(uint8_t* dst, const uint32_t* map, size_t count,
                                const SamplePicture& picture);
 
-void QuadSampleRow_scalar(uint8_t* dst, const uint32_t* map, size_t count,
-                          const SamplePicture& picture);
-void QuadSampleRow_sse2(uint8_t* dst, const uint32_t* map, size_t count,
-                        const SamplePicture& picture);
-void QuadSampleRow_avx2(uint8_t* dst, const uint32_t* map, size_t count,
-                        const SamplePicture& picture);
+KYV_FORMS(QuadSampleRow, QuadSampleRow)
 
 extern const KernelTable<QuadSampleRow> kQuadSampleRow;
 

@@ -36,10 +36,6 @@ void DreamyRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* soft, con
     }
 }
 
-constinit const KernelTable<DreamyRow> kDreamyRow = {
-    .scalar = DreamyRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(DreamyRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(DreamyRow_avx2),
-};
+constinit const KernelTable<DreamyRow> kDreamyRow = {KYV_TABLE(DreamyRow)};
 
 } // namespace kyv

@@ -22,12 +22,7 @@ struct DreamyMix {
 using DreamyRow = void (*)(uint8_t* dst, const uint8_t* src, const uint8_t* soft,
                            const uint8_t* glow, size_t count, const DreamyMix& mix);
 
-void DreamyRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* soft, const uint8_t* glow,
-                      size_t count, const DreamyMix& mix);
-void DreamyRow_sse2(uint8_t* dst, const uint8_t* src, const uint8_t* soft, const uint8_t* glow,
-                    size_t count, const DreamyMix& mix);
-void DreamyRow_avx2(uint8_t* dst, const uint8_t* src, const uint8_t* soft, const uint8_t* glow,
-                    size_t count, const DreamyMix& mix);
+KYV_FORMS(DreamyRow, DreamyRow)
 
 extern const KernelTable<DreamyRow> kDreamyRow;
 

@@ -24,10 +24,6 @@ void HighlightRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
     }
 }
 
-constinit const KernelTable<HighlightRow> kHighlightRow = {
-    .scalar = HighlightRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(HighlightRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(HighlightRow_avx2),
-};
+constinit const KernelTable<HighlightRow> kHighlightRow = {KYV_TABLE(HighlightRow)};
 
 } // namespace kyv

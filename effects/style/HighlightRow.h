@@ -21,10 +21,7 @@ struct Highlight {
 using HighlightRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count,
                               const Highlight& highlight);
 
-void HighlightRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
-                         const Highlight& highlight);
-void HighlightRow_sse2(uint8_t* dst, const uint8_t* src, size_t count, const Highlight& highlight);
-void HighlightRow_avx2(uint8_t* dst, const uint8_t* src, size_t count, const Highlight& highlight);
+KYV_FORMS(HighlightRow, HighlightRow)
 
 extern const KernelTable<HighlightRow> kHighlightRow;
 

@@ -15,10 +15,6 @@ void MaskMixRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* effect,
     }
 }
 
-constinit const KernelTable<MaskMixRow> kMaskMixRow = {
-    .scalar = MaskMixRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(MaskMixRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(MaskMixRow_avx2),
-};
+constinit const KernelTable<MaskMixRow> kMaskMixRow = {KYV_TABLE(MaskMixRow)};
 
 } // namespace kyv

@@ -13,12 +13,7 @@ namespace kyv {
 using MaskMixRow = void (*)(uint8_t* dst, const uint8_t* src, const uint8_t* effect,
                             const uint8_t* weights, size_t count);
 
-void MaskMixRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* effect,
-                       const uint8_t* weights, size_t count);
-void MaskMixRow_sse2(uint8_t* dst, const uint8_t* src, const uint8_t* effect,
-                     const uint8_t* weights, size_t count);
-void MaskMixRow_avx2(uint8_t* dst, const uint8_t* src, const uint8_t* effect,
-                     const uint8_t* weights, size_t count);
+KYV_FORMS(MaskMixRow, MaskMixRow)
 
 extern const KernelTable<MaskMixRow> kMaskMixRow;
 

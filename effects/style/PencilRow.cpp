@@ -71,25 +71,9 @@ void PencilPaperRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* ink,
     }
 }
 
-constinit const KernelTable<SmoothRow> kSmoothRow = {
-    .scalar = SmoothRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(SmoothRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(SmoothRow_avx2),
-};
-constinit const KernelTable<PencilLineRow> kPencilLineRow = {
-    .scalar = PencilLineRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(PencilLineRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(PencilLineRow_avx2),
-};
-constinit const KernelTable<PencilInkRow> kPencilInkRow = {
-    .scalar = PencilInkRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(PencilInkRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(PencilInkRow_avx2),
-};
-constinit const KernelTable<PencilPaperRow> kPencilPaperRow = {
-    .scalar = PencilPaperRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(PencilPaperRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(PencilPaperRow_avx2),
-};
+constinit const KernelTable<SmoothRow> kSmoothRow = {KYV_TABLE(SmoothRow)};
+constinit const KernelTable<PencilLineRow> kPencilLineRow = {KYV_TABLE(PencilLineRow)};
+constinit const KernelTable<PencilInkRow> kPencilInkRow = {KYV_TABLE(PencilInkRow)};
+constinit const KernelTable<PencilPaperRow> kPencilPaperRow = {KYV_TABLE(PencilPaperRow)};
 
 } // namespace kyv

@@ -57,30 +57,10 @@ using PencilInkRow = void (*)(uint8_t* dst, const PencilSources& sources, size_t
 using PencilPaperRow = void (*)(uint8_t* dst, const uint8_t* src, const uint8_t* ink,
                                 const uint8_t* valleys, size_t count);
 
-void SmoothRow_scalar(uint8_t* dst, const uint8_t* a, const uint8_t* b, const uint8_t* c,
-                      size_t count);
-void SmoothRow_sse2(uint8_t* dst, const uint8_t* a, const uint8_t* b, const uint8_t* c,
-                    size_t count);
-void SmoothRow_avx2(uint8_t* dst, const uint8_t* a, const uint8_t* b, const uint8_t* c,
-                    size_t count);
-void PencilLineRow_scalar(uint8_t* dst, const uint8_t* narrow, const uint8_t* wide, size_t count,
-                          const PencilLine& line);
-void PencilLineRow_sse2(uint8_t* dst, const uint8_t* narrow, const uint8_t* wide, size_t count,
-                        const PencilLine& line);
-void PencilLineRow_avx2(uint8_t* dst, const uint8_t* narrow, const uint8_t* wide, size_t count,
-                        const PencilLine& line);
-void PencilInkRow_scalar(uint8_t* dst, const PencilSources& sources, size_t count,
-                         const PencilTone& tone);
-void PencilInkRow_sse2(uint8_t* dst, const PencilSources& sources, size_t count,
-                       const PencilTone& tone);
-void PencilInkRow_avx2(uint8_t* dst, const PencilSources& sources, size_t count,
-                       const PencilTone& tone);
-void PencilPaperRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* ink,
-                           const uint8_t* valleys, size_t count);
-void PencilPaperRow_sse2(uint8_t* dst, const uint8_t* src, const uint8_t* ink,
-                         const uint8_t* valleys, size_t count);
-void PencilPaperRow_avx2(uint8_t* dst, const uint8_t* src, const uint8_t* ink,
-                         const uint8_t* valleys, size_t count);
+KYV_FORMS(SmoothRow, SmoothRow)
+KYV_FORMS(PencilLineRow, PencilLineRow)
+KYV_FORMS(PencilInkRow, PencilInkRow)
+KYV_FORMS(PencilPaperRow, PencilPaperRow)
 
 extern const KernelTable<SmoothRow> kSmoothRow;
 extern const KernelTable<PencilLineRow> kPencilLineRow;

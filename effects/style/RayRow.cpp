@@ -45,20 +45,8 @@ void RayAddRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* light, si
     }
 }
 
-constinit const KernelTable<RayLerpRow> kRayLerpRow = {
-    .scalar = RayLerpRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(RayLerpRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(RayLerpRow_avx2),
-};
-constinit const KernelTable<RayStepRow> kRayStepRow = {
-    .scalar = RayStepRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(RayStepRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(RayStepRow_avx2),
-};
-constinit const KernelTable<RayAddRow> kRayAddRow = {
-    .scalar = RayAddRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(RayAddRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(RayAddRow_avx2),
-};
+constinit const KernelTable<RayLerpRow> kRayLerpRow = {KYV_TABLE(RayLerpRow)};
+constinit const KernelTable<RayStepRow> kRayStepRow = {KYV_TABLE(RayStepRow)};
+constinit const KernelTable<RayAddRow> kRayAddRow = {KYV_TABLE(RayAddRow)};
 
 } // namespace kyv

@@ -39,21 +39,9 @@ using RayStepRow = void (*)(uint16_t* dst, const uint16_t* src, const uint16_t* 
 // source's. dst may be either.
 using RayAddRow = void (*)(uint8_t* dst, const uint8_t* src, const uint8_t* light, size_t count);
 
-void RayLerpRow_scalar(uint16_t* dst, const uint16_t* upper, const uint16_t* lower, size_t count,
-                       uint16_t fraction);
-void RayLerpRow_sse2(uint16_t* dst, const uint16_t* upper, const uint16_t* lower, size_t count,
-                     uint16_t fraction);
-void RayLerpRow_avx2(uint16_t* dst, const uint16_t* upper, const uint16_t* lower, size_t count,
-                     uint16_t fraction);
-void RayStepRow_scalar(uint16_t* dst, const uint16_t* src, const uint16_t* row, size_t count,
-                       const RayColumns& columns, const RayShares& shares);
-void RayStepRow_sse2(uint16_t* dst, const uint16_t* src, const uint16_t* row, size_t count,
-                     const RayColumns& columns, const RayShares& shares);
-void RayStepRow_avx2(uint16_t* dst, const uint16_t* src, const uint16_t* row, size_t count,
-                     const RayColumns& columns, const RayShares& shares);
-void RayAddRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* light, size_t count);
-void RayAddRow_sse2(uint8_t* dst, const uint8_t* src, const uint8_t* light, size_t count);
-void RayAddRow_avx2(uint8_t* dst, const uint8_t* src, const uint8_t* light, size_t count);
+KYV_FORMS(RayLerpRow, RayLerpRow)
+KYV_FORMS(RayStepRow, RayStepRow)
+KYV_FORMS(RayAddRow, RayAddRow)
 
 extern const KernelTable<RayLerpRow> kRayLerpRow;
 extern const KernelTable<RayStepRow> kRayStepRow;

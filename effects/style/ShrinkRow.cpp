@@ -22,14 +22,7 @@ void AverageRow_scalar(uint8_t* dst, const uint16_t* sums, size_t count, int32_t
     }
 }
 
-constinit const KernelTable<AddRow> kAddRow = {
-    .scalar = AddRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(AddRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(AddRow_avx2),
-};
-constinit const KernelTable<AverageRow> kAverageRow = {
-    .scalar = AverageRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(AverageRow_sse2),
-};
+constinit const KernelTable<AddRow> kAddRow = {KYV_TABLE(AddRow)};
+constinit const KernelTable<AverageRow> kAverageRow = {KYV_TABLE(AverageRow)};
 
 } // namespace kyv

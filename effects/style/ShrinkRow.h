@@ -18,11 +18,8 @@ using AddRow = void (*)(uint16_t* sums, const uint8_t* src, size_t count);
 // 1 << bits rows.
 using AverageRow = void (*)(uint8_t* dst, const uint16_t* sums, size_t count, int32_t bits);
 
-void AddRow_scalar(uint16_t* sums, const uint8_t* src, size_t count);
-void AddRow_sse2(uint16_t* sums, const uint8_t* src, size_t count);
-void AddRow_avx2(uint16_t* sums, const uint8_t* src, size_t count);
-void AverageRow_scalar(uint8_t* dst, const uint16_t* sums, size_t count, int32_t bits);
-void AverageRow_sse2(uint8_t* dst, const uint16_t* sums, size_t count, int32_t bits);
+KYV_FORMS(AddRow, AddRow)
+KYV_FORMS(AverageRow, AverageRow)
 
 extern const KernelTable<AddRow> kAddRow;
 extern const KernelTable<AverageRow> kAverageRow;

@@ -18,7 +18,8 @@
 //
 // Memory     Load Store LoadF32 StoreF32: unaligned, as all of them. LoadHalf: half a vector, the
 //            rest is undefined. LoadBytes16, LoadBytes32, LoadWords32: bytes or words as wider
-//            numbers, a vector full; StoreBytes16: words of 0..255 as bytes. StorePixel32.
+//            numbers, a vector full; LoadWords64: kLongs words, each four times; StoreBytes16:
+//            words of 0..255 as bytes. StorePixel32 Prefetch
 // Blocks     LoadBlock LoadHalves (eight bytes from each of two places) LoadInTurns32
 //            LoadBlockWords32 AddBlocks32 SubBlocks32; FromBlocks (each from a function of its
 //            number) Repeat (the same in every block) RepeatBytes FirstBlock SumOfBlocks32
@@ -43,11 +44,13 @@
 //            and InOrder64 undo what two packings, or one, do to the order of blocks. WidenLow8
 //            WidenHigh8: a block's bytes as words. ExtendLowS16 ExtendHighS16: the vector's first
 //            or last half as 32 bits. MixWords(even, odd) TwiceLow16 DoubleLow32 DoubleHigh32
-//            DoubleEach64 (of half a vector) InterleaveHalves16 AlphaWords SpreadHighWords
-//            SecondBytes
+//            DoubleEach64 (of half a vector) InterleaveHalves16 AlphaWords BlocksInOrder
+//            AddNeighbours32 SpreadHighWords SecondBytes
 // Floats     SplatF32 AddF32 SubF32 MulF32 DivF32 MinF32 MaxF32 SqrtF32 F32FromS32 TruncateF32
 //            AsFloats (the bits); MinF32 and MaxF32 give the last operand where one is not a number
-// Doubles    SplatF64 AddF64 SubF64 MulF64 DivF64 MinF64 MaxF64 SqrtF64, kLongs of them
+// Doubles    SplatF64 AddF64 SubF64 MulF64 DivF64 MinF64 MaxF64 SqrtF64 NegateF64, kLongs of them;
+//            LowF64 HighF64 (of Floats) ToFloats(low, high) TruncateF64(low, high) AsVec64
+//            FlipSign64 SelectLessF64(a, b, yes, no): yes where a < b
 // Bytes      ShuffleBytes(v, indices) within each block, 0 for an index below 0; MulAddBytes
 //            (unsigned, signed): words a0 * b0 + a1 * b1, saturated.
 // ShuffleBytes, MulAddBytes and MixWords take several instructions where kHasByteShuffle,

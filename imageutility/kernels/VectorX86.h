@@ -329,6 +329,44 @@ inline Vec RunningSums32(Block& total, Vec change) {
     return sums;
 }
 
+// Each of kLongs words in all four words of 64 bits.
+inline Vec LoadWords64(const uint16_t* from) {
+    const Vec words =
+        _mm512_cvtepu16_epi64(_mm_loadu_si128(reinterpret_cast<const __m128i*>(from)));
+    return _mm512_shuffle_epi8(words,
+                               _mm512_set4_epi32(0x09080908, 0x09080908, 0x01000100, 0x01000100));
+}
+// Two vectors whose blocks alternate between them, put one after the other.
+inline void BlocksInOrder(Vec& low, Vec& high) {
+    const Vec first =
+        _mm512_permutex2var_epi64(low, _mm512_setr_epi64(0, 1, 8, 9, 2, 3, 10, 11), high);
+    high = _mm512_permutex2var_epi64(low, _mm512_setr_epi64(4, 5, 12, 13, 6, 7, 14, 15), high);
+    low = first;
+}
+inline Doubles LowF64(Floats v) {
+    return _mm512_cvtps_pd(_mm512_castps512_ps256(v));
+}
+inline Doubles HighF64(Floats v) {
+    return _mm512_cvtps_pd(_mm512_extractf32x8_ps(v, 1));
+}
+inline Floats ToFloats(Doubles low, Doubles high) {
+    return _mm512_insertf32x8(_mm512_castps256_ps512(_mm512_cvtpd_ps(low)), _mm512_cvtpd_ps(high),
+                              1);
+}
+inline Vec TruncateF64(Doubles low, Doubles high) {
+    return _mm512_inserti64x4(_mm512_castsi256_si512(_mm512_cvttpd_epi32(low)),
+                              _mm512_cvttpd_epi32(high), 1);
+}
+inline Vec AsVec64(Doubles v) {
+    return _mm512_castpd_si512(v);
+}
+inline Doubles FlipSign64(Doubles v, Vec signs) {
+    return _mm512_xor_pd(v, _mm512_castsi512_pd(signs));
+}
+inline Doubles SelectLessF64(Doubles a, Doubles b, Doubles yes, Doubles no) {
+    return _mm512_mask_blend_pd(_mm512_cmp_pd_mask(a, b, _CMP_LT_OQ), no, yes);
+}
+
 // --- AVX2
 
 #elif defined(KYV_VECTOR_SET_AVX2)
@@ -419,6 +457,39 @@ inline Vec RunningSums32(Block& total, Vec change) {
     const Block first = _mm_add_epi32(total, _mm256_castsi256_si128(change));
     total = _mm_add_epi32(first, _mm256_extracti128_si256(change, 1));
     return _mm256_inserti128_si256(_mm256_castsi128_si256(first), total, 1);
+}
+
+inline Vec LoadWords64(const uint16_t* from) {
+    const Vec words =
+        _mm256_cvtepu16_epi64(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(from)));
+    return _mm256_shuffle_epi8(words, _mm256_broadcastsi128_si256(_mm_setr_epi32(
+                                          0x01000100, 0x01000100, 0x09080908, 0x09080908)));
+}
+inline void BlocksInOrder(Vec& low, Vec& high) {
+    const Vec first = _mm256_permute2x128_si256(low, high, 0x20);
+    high = _mm256_permute2x128_si256(low, high, 0x31);
+    low = first;
+}
+inline Doubles LowF64(Floats v) {
+    return _mm256_cvtps_pd(_mm256_castps256_ps128(v));
+}
+inline Doubles HighF64(Floats v) {
+    return _mm256_cvtps_pd(_mm256_extractf128_ps(v, 1));
+}
+inline Floats ToFloats(Doubles low, Doubles high) {
+    return _mm256_set_m128(_mm256_cvtpd_ps(high), _mm256_cvtpd_ps(low));
+}
+inline Vec TruncateF64(Doubles low, Doubles high) {
+    return _mm256_set_m128i(_mm256_cvttpd_epi32(high), _mm256_cvttpd_epi32(low));
+}
+inline Vec AsVec64(Doubles v) {
+    return _mm256_castpd_si256(v);
+}
+inline Doubles FlipSign64(Doubles v, Vec signs) {
+    return _mm256_xor_pd(v, _mm256_castsi256_pd(signs));
+}
+inline Doubles SelectLessF64(Doubles a, Doubles b, Doubles yes, Doubles no) {
+    return _mm256_blendv_pd(no, yes, _mm256_cmp_pd(a, b, _CMP_LT_OQ));
 }
 
 // --- SSE2 and SSSE3
@@ -519,7 +590,61 @@ inline Vec RunningSums32(Block& total, Vec change) {
     return total;
 }
 
+inline Vec LoadWords64(const uint16_t* from) {
+    int32_t both;
+    __builtin_memcpy(&both, from, sizeof both);
+    const Vec words = _mm_cvtsi32_si128(both);
+    const Vec twice = _mm_unpacklo_epi16(words, words);
+    return _mm_unpacklo_epi32(twice, twice);
+}
+inline void BlocksInOrder(Vec&, Vec&) {}
+inline Doubles LowF64(Floats v) {
+    return _mm_cvtps_pd(v);
+}
+inline Doubles HighF64(Floats v) {
+    return _mm_cvtps_pd(_mm_movehl_ps(v, v));
+}
+inline Floats ToFloats(Doubles low, Doubles high) {
+    return _mm_movelh_ps(_mm_cvtpd_ps(low), _mm_cvtpd_ps(high));
+}
+inline Vec TruncateF64(Doubles low, Doubles high) {
+    return _mm_unpacklo_epi64(_mm_cvttpd_epi32(low), _mm_cvttpd_epi32(high));
+}
+inline Vec AsVec64(Doubles v) {
+    return _mm_castpd_si128(v);
+}
+inline Doubles FlipSign64(Doubles v, Vec signs) {
+    return _mm_xor_pd(v, _mm_castsi128_pd(signs));
+}
+inline Doubles SelectLessF64(Doubles a, Doubles b, Doubles yes, Doubles no) {
+    const Doubles less = _mm_cmplt_pd(a, b);
+    return _mm_or_pd(_mm_and_pd(less, yes), _mm_andnot_pd(less, no));
+}
+
 #endif
+
+// Sums of neighbouring numbers of 32 bits: those of the one, block by block, then of the other.
+inline Vec AddNeighbours32(Vec a, Vec b) {
+#if defined(KYV_VECTOR_SET_AVX512)
+    const Floats x = _mm512_castsi512_ps(a), y = _mm512_castsi512_ps(b);
+    return Add32(_mm512_castps_si512(_mm512_shuffle_ps(x, y, _MM_SHUFFLE(2, 0, 2, 0))),
+                 _mm512_castps_si512(_mm512_shuffle_ps(x, y, _MM_SHUFFLE(3, 1, 3, 1))));
+#elif defined(KYV_VECTOR_SET_AVX2)
+    const Floats x = _mm256_castsi256_ps(a), y = _mm256_castsi256_ps(b);
+    return Add32(_mm256_castps_si256(_mm256_shuffle_ps(x, y, _MM_SHUFFLE(2, 0, 2, 0))),
+                 _mm256_castps_si256(_mm256_shuffle_ps(x, y, _MM_SHUFFLE(3, 1, 3, 1))));
+#else
+    const Floats x = _mm_castsi128_ps(a), y = _mm_castsi128_ps(b);
+    return Add32(_mm_castps_si128(_mm_shuffle_ps(x, y, _MM_SHUFFLE(2, 0, 2, 0))),
+                 _mm_castps_si128(_mm_shuffle_ps(x, y, _MM_SHUFFLE(3, 1, 3, 1))));
+#endif
+}
+inline Doubles NegateF64(Doubles v) {
+    return FlipSign64(v, Splat64(uint64_t{1} << 63));
+}
+inline void Prefetch(const void* at) {
+    _mm_prefetch(static_cast<const char*>(at), _MM_HINT_T0);
+}
 
 inline Block LoadBlock(const void* from) {
     return _mm_loadu_si128(static_cast<const __m128i*>(from));
