@@ -281,21 +281,6 @@ TEST(ColorTemperature, ComparisonBufferFollowsTheFrameSize) {
     EXPECT_EQ(instance.End(), KYV_OK);
 }
 
-TEST(ColorTemperature, WorksInPlace) {
-    const Frame input = RandomFrame(9 * 3, 5);
-    for (const uint32_t format : {0U, 1U}) {
-        CTestInstance instance(Temperature(), 9, 3);
-        instance.Context().pixelFormat = format;
-        ASSERT_EQ(instance.Begin(), KYV_OK);
-        instance.Set("P1", -0.6F);
-        Frame apart(input.size());
-        ASSERT_EQ(instance.Render(apart.data(), input.data()), KYV_OK);
-        Frame inPlace = input;
-        ASSERT_EQ(instance.Render(inPlace.data(), inPlace.data()), KYV_OK);
-        EXPECT_EQ(inPlace, apart);
-    }
-}
-
 TEST(ColorTemperature, WideAyuvFramesAreSplitWithoutASeam) {
     constexpr int kWidth = 5003; // the comparison ends inside one of several blocks
     const Frame input = RandomFrame(kWidth, 7);

@@ -68,35 +68,6 @@ INSTANTIATE_TEST_SUITE_P(All, StyleFilter,
                              return name.substr(name.rfind('_') + 1);
                          });
 
-TEST_P(StyleFilter, LevelsAndThreadsAgreeAtEverySize) {
-    for (const auto& [width, height] :
-         {std::pair{1U, 1U}, {1U, 9U}, {2U, 2U}, {9U, 1U}, {3U, 70U}, {67U, 41U}, {163U, 120U}}) {
-        for (const Frame& input : {Scene(width, height), RandomFrame(size_t{width} * height, 4)}) {
-            // In one instance, whose textures take a while to draw.
-            CTestInstance instance(Effect(GetParam()), width, height);
-            ASSERT_EQ(instance.Begin(), KYV_OK);
-            const auto at = [&](int32_t level, uint32_t threads) {
-                instance.Context().cpuLevel = level;
-                instance.Context().threadCount = threads;
-                Frame output(input.size());
-                EXPECT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
-                return output;
-            };
-            const Frame scalar = at(0, 1);
-            for (const int32_t level : {1, 3, 4, 5}) {
-                EXPECT_EQ(at(level, 1), scalar) << width << " x " << height << " level " << level;
-            }
-            for (const uint32_t threads : {0U, 2U, 3U, 7U}) {
-                EXPECT_EQ(at(5, threads), scalar) << width << " x " << height << " on " << threads;
-            }
-            // Alpha is the source's.
-            for (size_t i = 0; i < input.size(); ++i) {
-                ASSERT_EQ(scalar[i] >> 24, input[i] >> 24) << i;
-            }
-        }
-    }
-}
-
 // What the other tests compare with is made by the same build; this is what holds every build, on
 // either target, to the same bytes. A change that is meant to show needs new numbers here.
 TEST_P(StyleFilter, BytesAreTheSameInEveryBuild) {
@@ -133,7 +104,7 @@ TEST_P(StyleFilter, FieldsMakeUpTheFrameAndLeaveTheOtherRowsAlone) {
     }
 }
 
-TEST_P(StyleFilter, AyuvFramesAndViewsGiveTheSamePicture) {
+TEST_P(StyleFilter, AyuvFramesGiveTheSamePictureAndAlphaIsTheSources) {
     using namespace KYVImageUtility;
     constexpr int32_t kWidth = 50, kHeight = 30;
     Frame argb = Scene(kWidth, kHeight);
@@ -143,6 +114,9 @@ TEST_P(StyleFilter, AyuvFramesAndViewsGiveTheSamePicture) {
     a.ToAYUV(v);
     v.ToARGB(a); // what the filter gets to see
     Frame expected = On(argb, kWidth);
+    for (size_t i = 0; i < argb.size(); ++i) {
+        ASSERT_EQ(expected[i] >> 24, argb[i] >> 24) << i;
+    }
     Frame converted(expected.size());
     CImageARGB expectedView(reinterpret_cast<uint8_t*>(expected.data()), kWidth, kHeight,
                             kWidth * 4);
@@ -153,50 +127,6 @@ TEST_P(StyleFilter, AyuvFramesAndViewsGiveTheSamePicture) {
         instance.Context().pixelFormat = PixelFormat_Ayuv;
     };
     EXPECT_EQ(On(ayuv, kWidth, asAyuv), converted);
-
-    // Two views side by side: each as if it were alone.
-    for (const uint32_t layout : {1U, 2U}) {
-        const size_t shift = layout == 2 ? kWidth : 0;
-        Frame input = RandomFrame(argb.size() * 2, 9);
-        for (int32_t y = 0; y < kHeight; ++y) {
-            std::copy_n(&argb[size_t{kWidth} * y], kWidth, &input[size_t{2 * kWidth} * y + shift]);
-        }
-        CTestInstance instance(Effect(GetParam()), kWidth, kHeight);
-        instance.Context().stereoLayout = layout;
-        ASSERT_EQ(instance.Begin(), KYV_OK);
-        Frame output(input.size(), 7);
-        ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
-        for (int32_t y = 0; y < kHeight; ++y) {
-            for (int32_t x = 0; x < kWidth; ++x) {
-                const size_t row = size_t{2 * kWidth} * y;
-                ASSERT_EQ(output[row + shift + x], expected[size_t{kWidth} * y + x]) << x << y;
-                ASSERT_EQ(output[row + kWidth - shift + x], 7U) << x << ", " << y;
-            }
-        }
-    }
-}
-
-TEST_P(StyleFilter, WorksInPlaceAndDoesNotDependOnWhatCameBefore) {
-    constexpr uint32_t kWidth = 64, kHeight = 48;
-    const Frame input = Scene(kWidth, kHeight);
-    const Frame expected = On(input, kWidth);
-    CTestInstance instance(Effect(GetParam()), kWidth, kHeight);
-    ASSERT_EQ(instance.Begin(), KYV_OK);
-    const Frame other = RandomFrame(input.size(), 11);
-    Frame output(input.size());
-    ASSERT_EQ(instance.Render(output.data(), other.data()), KYV_OK);
-    Frame inPlace = input;
-    ASSERT_EQ(instance.Render(inPlace.data(), inPlace.data()), KYV_OK);
-    EXPECT_EQ(inPlace, expected);
-    // Another size, and back, in one preparation.
-    instance.Context().width = 17;
-    instance.Context().height = 9;
-    ASSERT_EQ(instance.Render(output.data(), other.data()), KYV_OK);
-    instance.Context().width = kWidth;
-    instance.Context().height = kHeight;
-    ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
-    EXPECT_EQ(output, expected);
-    EXPECT_NE(output, input);
 }
 
 // The mask is one piece of code for both.

@@ -182,24 +182,28 @@ TEST_P(Lifecycle, AbsurdFrameSizesAreRefused) {
 TEST_P(Lifecycle, InstancesOnTwoThreadsGiveWhatEachGivesAlone) {
     const auto render = [this](uint32_t seed) {
         Frame all;
-        CTestInstance instance(effect(), 33, 17);
+        CTestInstance instance(effect(), 70, 50);
         instance.Context().cpuLevel = 5;
         instance.Context().threadCount = 2;
-        instance.Context().duration = 100000000;
+        instance.Context().duration = 200000000;
+        instance.Context().randomSeed = seed;
         EXPECT_EQ(instance.Begin(), KYV_OK);
-        for (int frame = 0; frame < 5; ++frame) {
-            instance.Context().position = frame * 400000;
-            const Frame input = RandomFrame(33 * 17, seed + frame);
+        if (effect().params[0].type == ParamType_Float) {
+            instance.Set(effect().params[0].key, 0.1F * static_cast<float>(seed));
+        }
+        for (const int64_t seconds : {0, 4, 2, 9, 8}) {
+            instance.Context().position = seconds * 10000000;
+            const Frame input = RandomFrame(70 * 50, seed + static_cast<uint32_t>(seconds));
             Frame output(input.size());
             EXPECT_EQ(instance.Render(output.data(), input.data(), input.data()), KYV_OK);
             all.insert(all.end(), output.begin(), output.end());
         }
         return all;
     };
-    const Frame alone[2] = {render(1), render(100)};
+    const Frame alone[2] = {render(1), render(9)};
     Frame together[2];
     std::thread first([&] { together[0] = render(1); });
-    std::thread second([&] { together[1] = render(100); });
+    std::thread second([&] { together[1] = render(9); });
     first.join();
     second.join();
     EXPECT_EQ(together[0], alone[0]);
