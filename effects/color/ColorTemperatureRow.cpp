@@ -66,9 +66,6 @@ void ColorTemperatureRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
 }
 
 constinit const KernelTable<ColorTemperatureRow> kColorTemperatureRow = {
-    .scalar = ColorTemperatureRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(ColorTemperatureRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(ColorTemperatureRow_avx2),
-};
+    KYV_TABLE(ColorTemperatureRow)};
 
 } // namespace kyv

@@ -41,12 +41,7 @@ struct GainCurves {
 using ColorTemperatureRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count,
                                      const GainCurves& first, const GainCurves& second);
 
-void ColorTemperatureRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
-                                const GainCurves& first, const GainCurves& second);
-void ColorTemperatureRow_sse2(uint8_t* dst, const uint8_t* src, size_t count,
-                              const GainCurves& first, const GainCurves& second);
-void ColorTemperatureRow_avx2(uint8_t* dst, const uint8_t* src, size_t count,
-                              const GainCurves& first, const GainCurves& second);
+KYV_FORMS(ColorTemperatureRow, ColorTemperatureRow)
 
 extern const KernelTable<ColorTemperatureRow> kColorTemperatureRow;
 

@@ -62,10 +62,6 @@ void WhiteBalanceRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
     }
 }
 
-constinit const KernelTable<WhiteBalanceRow> kWhiteBalanceRow = {
-    .scalar = WhiteBalanceRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(WhiteBalanceRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(WhiteBalanceRow_avx2),
-};
+constinit const KernelTable<WhiteBalanceRow> kWhiteBalanceRow = {KYV_TABLE(WhiteBalanceRow)};
 
 } // namespace kyv

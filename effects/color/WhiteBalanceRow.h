@@ -40,10 +40,7 @@ struct KneeCurves {
 using WhiteBalanceRow = void (*)(uint8_t* dst, const uint8_t* src, size_t count,
                                  const KneeCurves& curves);
 
-void WhiteBalanceRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
-                            const KneeCurves& curves);
-void WhiteBalanceRow_sse2(uint8_t* dst, const uint8_t* src, size_t count, const KneeCurves& curves);
-void WhiteBalanceRow_avx2(uint8_t* dst, const uint8_t* src, size_t count, const KneeCurves& curves);
+KYV_FORMS(WhiteBalanceRow, WhiteBalanceRow)
 
 extern const KernelTable<WhiteBalanceRow> kWhiteBalanceRow;
 

@@ -5,11 +5,7 @@
 
 namespace kyv {
 
-constinit const KernelTable<MaskBlendRow> kMaskBlendRow = {
-    .scalar = MaskBlendRow_scalar,
-    .sse2 = KYV_VECTOR_FORM(MaskBlendRow_sse2),
-    .avx2 = KYV_VECTOR_FORM(MaskBlendRow_avx2),
-};
+constinit const KernelTable<MaskBlendRow> kMaskBlendRow = {KYV_TABLE(MaskBlendRow)};
 
 void MaskBlendRow_scalar(uint8_t* dst, const uint8_t* picture0, const uint8_t* picture1,
                          const uint8_t* mask, size_t count, const MaskBlend& blend) {

@@ -30,12 +30,7 @@ struct MaskBlend {
 using MaskBlendRow = void (*)(uint8_t* dst, const uint8_t* picture0, const uint8_t* picture1,
                               const uint8_t* mask, size_t count, const MaskBlend& blend);
 
-void MaskBlendRow_scalar(uint8_t* dst, const uint8_t* picture0, const uint8_t* picture1,
-                         const uint8_t* mask, size_t count, const MaskBlend& blend);
-void MaskBlendRow_sse2(uint8_t* dst, const uint8_t* picture0, const uint8_t* picture1,
-                       const uint8_t* mask, size_t count, const MaskBlend& blend);
-void MaskBlendRow_avx2(uint8_t* dst, const uint8_t* picture0, const uint8_t* picture1,
-                       const uint8_t* mask, size_t count, const MaskBlend& blend);
+KYV_FORMS(MaskBlendRow, MaskBlendRow)
 
 extern const KernelTable<MaskBlendRow> kMaskBlendRow;
 
