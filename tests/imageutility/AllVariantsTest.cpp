@@ -1,5 +1,6 @@
 // Every form of every kernel against its scalar form, byte for byte.
 #include <algorithm>
+#include <cstdint>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
@@ -12,6 +13,21 @@
 #include <gtest/gtest.h>
 
 #include "tests/support/KernelCatalog.h"
+#include "tests/support/SetProbe.h"
+
+namespace kyv {
+
+SetProbeResult SetProbe_scalar() {
+    return {InstructionSet::Scalar, 0};
+}
+
+namespace {
+
+constexpr KernelTable<SetProbeRow> kSetProbe = {KYV_TABLE(SetProbe),
+                                                .passedOver = kNoneIsPassedOver};
+
+} // namespace
+} // namespace kyv
 
 namespace {
 
@@ -292,6 +308,111 @@ TEST_P(AllVariants, AgreeOnEveryInput) {
 
 INSTANTIATE_TEST_SUITE_P(Kernels, AllVariants, testing::ValuesIn(KernelCatalog()),
                          [](const auto& entry) { return entry.param.table; });
+
+// A processor that this one may not be, and the best set for it.
+struct PretendedProcessor {
+    const char* name;
+    kyv::ProcessorFeatures features;
+    InstructionSet best;
+};
+
+const PretendedProcessor kProcessors[] = {
+    {"SSE2 alone", {}, InstructionSet::Sse2},
+    {"with SSSE3", {.ssse3 = true}, InstructionSet::Ssse3},
+    {"with AVX2", {.ssse3 = true, .avx2 = true}, InstructionSet::Avx2},
+    {"AVX-512 without bytes and words",
+     {.ssse3 = true, .avx2 = true, .avx512f = true},
+     InstructionSet::Avx2},
+    {"AVX-512 without doublewords",
+     {.ssse3 = true, .avx2 = true, .avx512f = true, .avx512bw = true, .avx512vl = true},
+     InstructionSet::Avx2},
+    {"AVX-512 without vector lengths",
+     {.ssse3 = true, .avx2 = true, .avx512f = true, .avx512bw = true, .avx512dq = true},
+     InstructionSet::Avx2},
+    {"with all of AVX-512",
+     {.ssse3 = true,
+      .avx2 = true,
+      .avx512f = true,
+      .avx512bw = true,
+      .avx512dq = true,
+      .avx512vl = true},
+     InstructionSet::Avx512},
+    {"AVX-512 under a system that keeps no wide registers",
+     {.ssse3 = true, .avx512bw = true, .avx512dq = true, .avx512vl = true},
+     InstructionSet::Ssse3},
+};
+
+// What a host's level comes to on a processor whose best set is given.
+InstructionSet ExpectedSet(int32_t level, InstructionSet best) {
+    return level < 3 ? InstructionSet::Scalar : level == 3 ? InstructionSet::Sse2 : best;
+}
+
+constexpr int32_t kLevels[] = {INT32_MIN, -1, 0, 1, 2, 3, 4, 5, 100, INT32_MAX};
+
+TEST(Levels, ComeToASetOnEveryProcessor) {
+    for (const PretendedProcessor& processor : kProcessors) {
+        EXPECT_EQ(kyv::ProcessorInstructionSet(processor.features), processor.best)
+            << processor.name;
+        for (const int32_t level : kLevels) {
+            EXPECT_EQ(kyv::Resolve(level, processor.features), ExpectedSet(level, processor.best))
+                << processor.name << ", level " << level;
+        }
+    }
+    for (const int32_t level : kLevels) {
+        EXPECT_EQ(kyv::Resolve(level), ExpectedSet(level, kyv::ProcessorInstructionSet()))
+            << "this processor, level " << level;
+    }
+}
+
+// Tables for which AVX-512 wins in a whole effect; all others stay with AVX2.
+const std::set<std::string> kWideTables = {};
+
+TEST(Levels, SelectTheFormOfTheirSetInEveryTable) {
+    for (const KernelEntry& entry : KernelCatalog()) {
+        // No form stands for two sets.
+        std::set<const void*> forms;
+        for (const InstructionSet set : kInstructionSets) {
+            if (entry.hasForm(set)) {
+                EXPECT_TRUE(forms.insert(entry.exact(set)).second)
+                    << entry.table << " " << NameOf(set);
+            }
+        }
+        for (const PretendedProcessor& processor : kProcessors) {
+            for (const int32_t level : kLevels) {
+                InstructionSet expected = ExpectedSet(level, processor.best);
+                if (expected == InstructionSet::Avx512 && !kWideTables.contains(entry.table)) {
+                    expected = InstructionSet::Avx2;
+                }
+                while (!entry.hasForm(expected)) {
+                    expected = static_cast<InstructionSet>(static_cast<int>(expected) - 1);
+                }
+                EXPECT_EQ(entry.selected(kyv::Resolve(level, processor.features)),
+                          entry.exact(expected))
+                    << entry.table << ", " << processor.name << ", level " << level << ": not "
+                    << NameOf(expected);
+            }
+        }
+    }
+}
+
+#ifndef KYV_NO_VECTOR_KERNELS
+// All tables are made by the same words, so what they hold for the probe they hold for all.
+TEST(Levels, ReachTheCodeThatWasCompiledForTheirSet) {
+    for (const PretendedProcessor& processor : kProcessors) {
+        for (const int32_t level : kLevels) {
+            const InstructionSet expected = ExpectedSet(level, processor.best);
+            const kyv::SetProbeResult probe =
+                kyv::kSetProbe.For(kyv::Resolve(level, processor.features))();
+            EXPECT_EQ(probe.set, expected) << processor.name << ", level " << level;
+            const size_t bytes = expected == InstructionSet::Scalar   ? 0
+                                 : expected == InstructionSet::Avx512 ? 64
+                                 : expected == InstructionSet::Avx2   ? 32
+                                                                      : 16;
+            EXPECT_EQ(probe.vectorBytes, bytes) << processor.name << ", level " << level;
+        }
+    }
+}
+#endif
 
 // A table that nobody listed would never be compared.
 TEST(KernelCatalog, NamesEveryTableOfTheSources) {

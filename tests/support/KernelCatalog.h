@@ -50,6 +50,10 @@ struct KernelEntry {
 
     // True when the table has a form for exactly this set.
     std::function<bool(kyv::InstructionSet)> hasForm = {};
+    // Where the form for exactly this set lies, and where the one does that the table selects
+    // within a set: to be told apart, not to be called.
+    std::function<const void*(kyv::InstructionSet)> exact = {};
+    std::function<const void*(kyv::InstructionSet)> selected = {};
     // Makes the parameters that belong to a seed and gives the loop over a block with them.
     std::function<KernelRun(uint32_t seed)> prepare = {};
 };

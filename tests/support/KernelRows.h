@@ -11,6 +11,12 @@ namespace kyvtest {
 template <class Function, class Bind>
 KernelEntry Blocks(const kyv::KernelTable<Function>& table, KernelEntry entry, Bind bind) {
     entry.hasForm = [&table](kyv::InstructionSet set) { return table.Exact(set) != nullptr; };
+    entry.exact = [&table](kyv::InstructionSet set) {
+        return reinterpret_cast<const void*>(table.Exact(set));
+    };
+    entry.selected = [&table](kyv::InstructionSet set) {
+        return reinterpret_cast<const void*>(table.For(set));
+    };
     entry.prepare = [&table, bind](uint32_t seed) -> KernelRun {
         return [&table, block = bind(seed)](kyv::InstructionSet set, const KernelBuffers& buffers) {
             block(table.Exact(set), buffers);
