@@ -30,7 +30,8 @@ inline void DrawPixels(uint8_t* dst, const uint8_t* weights, GetFirst first, Get
 }
 
 // The pixels that have a shuffle for every two.
-inline size_t DrawShuffled(uint8_t* dst, const uint8_t* src, const BilinearColumns& columns) {
+[[maybe_unused]] inline size_t DrawShuffled(uint8_t* dst, const uint8_t* src,
+                                            const BilinearColumns& columns) {
     size_t i = 0;
     for (; i + kPixels <= columns.shuffled; i += kPixels) {
         const auto two = [&](size_t from) {

@@ -25,7 +25,7 @@ inline Channels Convert(Vec vuya) {
             .ua = ua};
 }
 
-inline Vec PackTwo(Vec first, Vec second) {
+[[maybe_unused]] inline Vec PackTwo(Vec first, Vec second) {
     return PackS32(ShiftRightS32<12>(first), ShiftRightS32<12>(second));
 }
 
