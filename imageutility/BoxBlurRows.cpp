@@ -116,18 +116,27 @@ void CBoxBlurRows::Slide(const uint8_t* enter, const uint8_t* leave) {
 }
 
 void CBoxBlurRows::Blur(uint8_t* dst, int32_t y, const uint8_t* enter, const uint8_t* leave) {
-    enter = enter ? enter : m_pNoRow;
-    leave = leave ? leave : m_pNoRow;
-    const auto count = static_cast<size_t>(m_nWidth);
+    BlurPart(dst, y, 0, m_nWidth, enter ? enter : m_pNoRow, leave ? leave : m_pNoRow);
+}
+
+void CBoxBlurRows::Average(uint8_t* dst, int32_t y, int32_t first, int32_t end) {
+    BlurPart(dst, y, first, end, m_pNoRow, m_pNoRow);
+}
+
+void CBoxBlurRows::BlurPart(uint8_t* dst, int32_t y, int32_t first, int32_t end,
+                            const uint8_t* enter, const uint8_t* leave) {
+    const auto count = static_cast<size_t>(end - first);
     const BoxWindows windows = {.radius = m_nRadius,
                                 .rows = WindowLength(y, m_nHeight, m_nRadius),
-                                .columns = m_pColumns,
-                                .reciprocals = m_pReciprocals};
+                                .columns = m_pColumns + first,
+                                .reciprocals = m_pReciprocals + first};
+    const ptrdiff_t at = ptrdiff_t{4} * first;
     if (!m_bWide) {
-        kBoxBlur16.For(m_set)(dst, static_cast<uint16_t*>(m_pSums), enter, leave, count, windows);
+        kBoxBlur16.For(m_set)(dst + at, static_cast<uint16_t*>(m_pSums) + at, enter, leave, count,
+                              windows);
     } else {
         const BoxBlurRow32 blur = m_nRadius <= kBoxRadiusMax ? kBoxBlur32.For(m_set) : BlurHugeRow;
-        blur(dst, static_cast<uint32_t*>(m_pSums), enter, leave, count, windows);
+        blur(dst + at, static_cast<uint32_t*>(m_pSums) + at, enter, leave, count, windows);
     }
 }
 

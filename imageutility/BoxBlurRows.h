@@ -32,7 +32,15 @@ public:
     // Slides, and writes the averages of row y, which must not overlap the two rows.
     void Blur(uint8_t* dst, int32_t y, const uint8_t* enter, const uint8_t* leave);
 
+    // Writes, after Slide, the averages of the columns from first to before end alone, to their
+    // places in row y. The radius + 1 columns to either side of them must hold zeros all down the
+    // window, where they are inside the image.
+    void Average(uint8_t* dst, int32_t y, int32_t first, int32_t end);
+
 private:
+    void BlurPart(uint8_t* dst, int32_t y, int32_t first, int32_t end, const uint8_t* enter,
+                  const uint8_t* leave);
+
     std::unique_ptr<CPageBlock> m_pBlock;
     size_t m_nBytes = 0;
     int32_t m_nWidth = 0;

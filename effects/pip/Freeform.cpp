@@ -234,7 +234,7 @@ private:
             recipe.second = settings.second;
             recipe.direction = settings.direction;
             recipe.blur = blur(settings);
-            layer.Begin(recipe, m_work.borderSpans, m_work.coverage,
+            layer.Begin(recipe, m_pip.Spans(), m_work.borderSpans, m_work.coverage,
                         foreground.GetInstructionSet());
         };
         if (m_settings.border.enabled) {

@@ -46,6 +46,10 @@ void CPictureRows::Begin(CFreeformPiP& pip, const CImageARGB& foreground,
     if (settings.blur > 0) {
         m_clearRow.assign(static_cast<size_t>(m_nWidth), m_clear);
         m_blurred.resize(static_cast<size_t>(m_nWidth));
+        m_extents.Begin(m_nHeight);
+        for (int32_t y = m_box.top; y < m_box.bottom; ++y) {
+            m_extents.Add(y, pip.Spans().Row(y));
+        }
     }
 }
 
@@ -130,9 +134,21 @@ void CPictureRows::Blend(int32_t y, uint8_t* frameRow, uint8_t opacity) {
     } else {
         leave = BlurSource(y - radius - 1);
     }
-    m_window.Blur(Bytes(m_blurred.data() + m_part.left), y, BlurSource(y + radius), leave);
+    const uint8_t* enter = BlurSource(y + radius);
+    uint8_t* blurred = Bytes(m_blurred.data() + m_part.left);
     m_nBlurred = y;
-    blendPart(m_blurred.data(), m_reach.left, m_reach.right);
+    const Run reach = {m_reach.left, m_reach.right};
+    if (m_clear != 0) {
+        m_window.Blur(blurred, y, enter, leave);
+    } else {
+        m_window.Slide(enter, leave);
+        m_extents.ForWindow(y, radius, reach, [&](int32_t first, int32_t end) {
+            m_window.Average(blurred, y, first - m_part.left, end - m_part.left);
+        });
+    }
+    m_extents.ForWindow(y, radius, reach, [&](int32_t first, int32_t end) {
+        blendPart(m_blurred.data(), first, end);
+    });
 }
 
 } // namespace kyv

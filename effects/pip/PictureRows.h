@@ -75,6 +75,7 @@ private:
     int32_t m_nBlurred = 0;
     CRowRing m_rows;
     CBoxBlurRows m_window;
+    CRowExtents m_extents; // of the quad
     std::vector<uint32_t> m_clearRow;
     std::vector<uint32_t> m_blurred;
 };

@@ -9,12 +9,12 @@
 
 namespace kyv {
 
-void CPipLayer::Begin(const LayerRecipe& recipe, const CSpanRows& shape, const CCoverage& coverage,
-                      InstructionSet set) {
+void CPipLayer::Begin(const LayerRecipe& recipe, const CSpanRows& quad, const CSpanRows& border,
+                      const CCoverage& coverage, InstructionSet set) {
     m_bRemake = m_made != Made{recipe, coverage.Serial()};
     m_made.reset();
     m_recipe = recipe;
-    m_pShape = &shape;
+    m_pBorder = &border;
     m_pCoverage = &coverage;
     m_set = set;
     m_nBlurred = -1;
@@ -36,7 +36,26 @@ void CPipLayer::Begin(const LayerRecipe& recipe, const CSpanRows& shape, const C
         m_sources.Reserve(m_part.Width(), std::min(2 * radius + 2, frame.bottom));
         m_clearRow.assign(static_cast<size_t>(m_part.Width()), m_clear);
     }
+    PrepareExtents(quad);
     PrepareGradient();
+}
+
+void CPipLayer::PrepareExtents(const CSpanRows& quad) {
+    m_extents.Begin(m_recipe.shape.height);
+    for (int32_t y = m_content.top; y < m_content.bottom; ++y) {
+        const int32_t from = y - m_recipe.dy;
+        m_covered.clear();
+        if (m_recipe.takesBorder) {
+            Unite(m_pBorder->Row(from),
+                  m_recipe.takesPicture ? quad.Row(from) : std::span<const Run>(), m_covered);
+        } else if (m_recipe.takesPicture) {
+            m_covered.assign(quad.Row(from).begin(), quad.Row(from).end());
+        }
+        for (Run& run : m_covered) {
+            run = {run.first + m_recipe.dx, run.end + m_recipe.dx};
+        }
+        m_extents.Add(y, m_covered);
+    }
 }
 
 void CPipLayer::PrepareGradient() {
@@ -85,7 +104,7 @@ void CPipLayer::Fill(int32_t y, uint8_t* part) {
     std::fill_n(pixels, m_part.Width(), m_clear);
     const int32_t from = y - m_recipe.dy;
     m_pCoverage->GetRuns(from, m_picture);
-    const std::span<const Run> shape = m_pShape->Row(from);
+    const std::span<const Run> shape = m_pBorder->Row(from);
     if (m_recipe.takesPicture && m_recipe.takesBorder) {
         Unite(m_picture, shape, m_covered);
     } else if (m_recipe.takesPicture) {
@@ -139,6 +158,12 @@ const uint8_t* CPipLayer::BlurSource(int32_t y) {
     return row;
 }
 
+// take(first, end) for the columns of a row that the layer's pixels reach.
+template <class Take>
+void CPipLayer::ForReach(int32_t y, Take&& take) const {
+    m_extents.ForWindow(y, m_recipe.blur, {m_reach.left, m_reach.right}, take);
+}
+
 void CPipLayer::MakeRow(int32_t y) {
     const int32_t radius = m_recipe.blur;
     if (radius == 0) {
@@ -157,8 +182,16 @@ void CPipLayer::MakeRow(int32_t y) {
     } else {
         leave = BlurSource(y - radius - 1);
     }
-    m_window.Blur(Kept(m_part.left, y), y, BlurSource(y + radius), leave);
+    const uint8_t* enter = BlurSource(y + radius);
     m_nBlurred = y;
+    if (m_clear != 0) {
+        m_window.Blur(Kept(m_part.left, y), y, enter, leave);
+        return;
+    }
+    m_window.Slide(enter, leave);
+    ForReach(y, [&](int32_t first, int32_t end) {
+        m_window.Average(Kept(m_part.left, y), y, first - m_part.left, end - m_part.left);
+    });
 }
 
 void CPipLayer::Blend(int32_t y, uint8_t* frameRow, uint8_t opacity) {
@@ -169,8 +202,10 @@ void CPipLayer::Blend(int32_t y, uint8_t* frameRow, uint8_t opacity) {
         MakeRow(y);
     }
     if (frameRow) {
-        kAlphaBlend.For(m_set)(frameRow + ptrdiff_t{4} * m_reach.left, Kept(m_reach.left, y),
-                               static_cast<size_t>(m_reach.Width()), opacity);
+        ForReach(y, [&](int32_t first, int32_t end) {
+            kAlphaBlend.For(m_set)(frameRow + ptrdiff_t{4} * first, Kept(first, y),
+                                   static_cast<size_t>(end - first), opacity);
+        });
     }
 }
 

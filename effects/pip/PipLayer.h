@@ -55,13 +55,11 @@ struct LayerRecipe {
 
 class CPipLayer {
 public:
-    // A frame follows. The shape and the coverage must be there until End, the shape finished and
-    // the coverage as it goes: row y is made from its rows down to y + Lead(). Throws
-    // std::bad_alloc, as does Blend.
-    void Begin(const LayerRecipe& recipe, const CSpanRows& shape, const CCoverage& coverage,
-               InstructionSet set);
-
-    int32_t Lead() const { return m_recipe.blur - m_recipe.dy; }
+    // A frame follows. The quad's and the border's pixels and the coverage must be there until End,
+    // the former finished and the latter as it goes: row y is made from its rows down to
+    // y + blur - dy. Throws std::bad_alloc, as does Blend.
+    void Begin(const LayerRecipe& recipe, const CSpanRows& quad, const CSpanRows& border,
+               const CCoverage& coverage, InstructionSet set);
 
     // Blends row y, all of which come in order, over the frame's row; null makes it and no more.
     void Blend(int32_t y, uint8_t* frameRow, uint8_t opacity);
@@ -76,11 +74,14 @@ private:
         bool operator==(const Made&) const = default;
     };
 
+    void PrepareExtents(const CSpanRows& quad);
     void PrepareGradient();
     uint8_t* Kept(int32_t x, int32_t y) {
         return reinterpret_cast<uint8_t*>(m_pixels.data() + static_cast<size_t>(y) * m_width +
                                           static_cast<size_t>(x));
     }
+    template <class Take>
+    void ForReach(int32_t y, Take&& take) const;
     void MakeRow(int32_t y);
     void Fill(int32_t y, uint8_t* part);
     const uint8_t* BlurSource(int32_t y);
@@ -91,7 +92,7 @@ private:
     size_t m_width = 0;
 
     LayerRecipe m_recipe = {};
-    const CSpanRows* m_pShape = nullptr;
+    const CSpanRows* m_pBorder = nullptr;
     const CCoverage* m_pCoverage = nullptr;
     InstructionSet m_set = InstructionSet::Scalar;
     bool m_bRemake = true;
@@ -105,6 +106,7 @@ private:
     CBoxBlurRows m_window;
     std::vector<uint32_t> m_clearRow;
     std::vector<float> m_gradient; // of the part's columns; empty for one colour
+    CRowExtents m_extents;         // of what may be covered
     Runs m_picture, m_border, m_covered;
 };
 

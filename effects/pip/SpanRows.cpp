@@ -96,4 +96,37 @@ std::span<const Run> CSpanRows::Row(int32_t y) const {
     return {m_runs.data() + m_starts[row], m_starts[row + 1] - m_starts[row]};
 }
 
+void CRowExtents::Extent::Include(const Extent& other) {
+    hull = {std::min(hull.first, other.hull.first), std::max(hull.end, other.hull.end)};
+    hole = {std::max(hole.first, other.hole.first), std::min(hole.end, other.hole.end)};
+}
+
+void CRowExtents::Begin(int32_t rows) {
+    m_blocks.assign(static_cast<size_t>(rows + kBlockRows - 1) / kBlockRows, Extent());
+}
+
+void CRowExtents::Add(int32_t y, std::span<const Run> runs) {
+    if (runs.empty()) {
+        return;
+    }
+    Run hole = {0, 0};
+    for (size_t i = 1; i < runs.size(); ++i) {
+        if (runs[i].first - runs[i - 1].end > hole.end - hole.first) {
+            hole = {runs[i - 1].end, runs[i].first};
+        }
+    }
+    Extent& block = m_blocks[static_cast<size_t>(y / kBlockRows)];
+    block.Include({{runs.front().first, runs.back().end}, hole});
+}
+
+CRowExtents::Extent CRowExtents::Window(int32_t from, int32_t to) const {
+    Extent window;
+    const auto last = std::min(static_cast<size_t>(to / kBlockRows) + 1, m_blocks.size());
+    for (auto i = static_cast<size_t>(std::max(from, 0) / kBlockRows); i < last; ++i) {
+        window.Include(m_blocks[i]);
+    }
+    // Without any pixels the hull has no columns, whatever it is cut to.
+    return window.hull.first < window.hull.end ? window : Extent{{kFar, -kFar}, {0, 0}};
+}
+
 } // namespace kyv

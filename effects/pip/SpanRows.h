@@ -81,4 +81,48 @@ private:
     PixelBox m_bounds = {};
 };
 
+// About what may be covered in every row: one run, or two with a hole between them that is worth
+// leaving out. For windows of rows it is told by blocks of rows, at once and never too little.
+class CRowExtents {
+public:
+    void Begin(int32_t rows);
+    // Rows are given in order, each once.
+    void Add(int32_t y, std::span<const Run> runs);
+
+    // take(first, end) for the columns within `cut` that the pixels of the rows y - radius to
+    // y + radius reach, radius columns to either side. Two runs lie more than radius columns apart.
+    template <class Take>
+    void ForWindow(int32_t y, int32_t radius, Run cut, Take&& take) const {
+        constexpr int32_t kWorthLeaving = 64; // columns
+        const Extent window = Window(y - radius, y + radius);
+        Run runs[2] = {{window.hull.first - radius, window.hull.end + radius}, {0, 0}};
+        if (window.hole.end - window.hole.first >= 3 * radius + kWorthLeaving) {
+            runs[1] = {window.hole.end - radius, runs[0].end};
+            runs[0].end = window.hole.first + radius;
+        }
+        for (const Run& run : runs) {
+            const int32_t first = std::max(run.first, cut.first);
+            const int32_t end = std::min(run.end, cut.end);
+            if (first < end) {
+                take(first, end);
+            }
+        }
+    }
+
+private:
+    static constexpr int32_t kBlockRows = 8;
+    static constexpr int32_t kFar = 1 << 28;
+
+    struct Extent {
+        Run hull = {kFar, -kFar};
+        Run hole = {-kFar, kFar};
+
+        void Include(const Extent& other);
+    };
+
+    Extent Window(int32_t from, int32_t to) const;
+
+    std::vector<Extent> m_blocks;
+};
+
 } // namespace kyv
