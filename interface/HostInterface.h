@@ -270,6 +270,14 @@ enum CpuLevel {
     CpuLevel_Avx2 = 5,
 };
 
+// What the upper 16 bits of EffectContext::cpuLevel ask for when they hold exactly one of these;
+// the level is then in the lower 16 bits. With any other upper bits the whole number is a level.
+enum CpuLevelOption {
+    // The picture-in-picture shows pictures of more than 1024 columns or rows as they are. Without
+    // this only the first 1024 of each are reached, and what lies beyond repeats them.
+    CpuLevelOption_WideMap = 0x4B590000,
+};
+
 // The host's own object. InitInstance calls the first operation of its function table and ignores
 // the result. In C++ an abstract class whose first virtual function takes no argument fits.
 typedef struct HostNotificationTable {

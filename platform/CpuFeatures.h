@@ -27,8 +27,9 @@ const ProcessorFeatures& GetProcessorFeatures();
 InstructionSet ProcessorInstructionSet(const ProcessorFeatures& features);
 InstructionSet ProcessorInstructionSet();
 
-// The set for a host level on a processor: below 3 scalar, 3 SSE2, from 4 the best that it has. The
-// level is a ceiling, so one set too high cannot reach a missing instruction.
+// The set for a host level on a processor: below 3 scalar, 3 SSE2,
+// from 4 the best that it has. The level is a ceiling, so one set too high cannot reach a missing
+// instruction.
 InstructionSet Resolve(int32_t cpuLevel, const ProcessorFeatures& features);
 InstructionSet Resolve(int32_t cpuLevel);
 
@@ -39,8 +40,17 @@ struct ResolvedLevel {
     InstructionSet set;
 };
 
+// A host may put this option, for the picture-in-picture's map, into the upper half of a level. It
+// is no part of what is resolved.
+inline constexpr int32_t kWideMapOption = 0x4B590000;
+
+constexpr bool HasWideMapOption(int32_t cpuLevel) {
+    return (cpuLevel & ~0xFFFF) == kWideMapOption;
+}
+
 inline ResolvedLevel ResolveLevel(int32_t cpuLevel) {
-    return {cpuLevel, Resolve(cpuLevel)};
+    const int32_t level = HasWideMapOption(cpuLevel) ? cpuLevel & 0xFFFF : cpuLevel;
+    return {level, Resolve(level)};
 }
 
 } // namespace kyv

@@ -39,6 +39,8 @@ constexpr float ReferenceHeight = 240.0F;
 // The bounding box takes no coordinate beyond this.
 constexpr int32_t kFarthestInBox = 99999;
 
+static_assert(kWideMapOption == CpuLevelOption_WideMap);
+
 struct LayerSettings {
     bool enabled;
     uint8_t alpha;
@@ -55,6 +57,7 @@ struct Settings {
     int32_t shadowX, shadowY;
     LayerSettings border;
     int32_t borderSize;
+    bool wideMap; // for pictures beyond 1024 columns or rows
 
     bool DrawsAnything() const { return picture.enabled || shadow.enabled || border.enabled; }
 };
@@ -118,6 +121,7 @@ Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometr
     s.border.direction = params.Int(Param::BorderType);
     s.border.alpha = params.Byte(Param::BorderAlpha);
     s.border.blur = Scale(params.Int(Param::BorderBlur), scaleBlur);
+    s.wideMap = HasWideMapOption(context.cpuLevel);
     return s;
 }
 
@@ -193,6 +197,7 @@ private:
         const int32_t height = foreground.GetHeight();
         const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
         m_pip.SetSize(width, height, width, height);
+        m_pip.SetWide(m_settings.wideMap);
         m_pip.SetSourcePoints(source, 4);
         m_pip.SetDestPoints(m_settings.corners, 4);
 

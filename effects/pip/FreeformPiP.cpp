@@ -16,6 +16,8 @@ using KYVImageUtility::CImageARGB;
 // callback.
 std::atomic<CFreeformPiP*> g_current = nullptr;
 
+constexpr int32_t kTileSize = 1024; // columns and rows that entries address
+
 void ToFloat(const RasterPoint (&points)[4], RasterPointF (&floats)[4]) {
     std::transform(points, points + 4, floats, [](RasterPoint p) {
         return RasterPointF{static_cast<float>(p.x), static_cast<float>(p.y)};
@@ -122,8 +124,74 @@ bool CFreeformPiP::Prepare(const CImageARGB* source, InstructionSet set) {
                 m_spans.Add(y, first, last);
             });
         m_spans.Finish();
+        m_tiles.clear();
+        m_tileStarts.resize(static_cast<size_t>(m_nDestHeight));
     }
     return true;
+}
+
+void CFreeformPiP::SetWide(bool wide) {
+    m_bDirty = m_bDirty || wide != m_bWide;
+    m_bWide = wide;
+}
+
+bool CFreeformPiP::IsWide() const {
+    return m_bWide && (m_nSourceWidth > kTileSize || m_nSourceHeight > kTileSize) &&
+           (m_nMapMode == MapMode_Nearest || m_nMapMode == MapMode_Bilinear);
+}
+
+// The operations are those of the map with the picture at 1/1024 of its size, which a double holds
+// as exactly, so that tile and entry fit together to the last bit.
+uint32_t CFreeformPiP::TileOf(int32_t x, int32_t y) const {
+    constexpr double kPart = 1.0 / kTileSize;
+    uint32_t entry = 0;
+    if (m_nQuadModel == QuadModel_InverseBilinear) {
+        QuadMapRowPlan plan = m_model.PlanRow(y);
+        plan.originU *= kPart;
+        plan.originV *= kPart;
+        plan.rangeU *= kPart;
+        plan.rangeV *= kPart;
+        entry = MapEntry(plan, x);
+    } else if (const QuadPoint point = m_model.WachspressPoint(x, y); point.inside) {
+        entry = MapEntry(point.u * kPart, point.v * kPart);
+    }
+    return entry >> 6 & 0x03FF03FF;
+}
+
+// Of a block that begins and ends in one tile all pixels are in it when their entries lie between
+// those at its ends; of others every pixel is asked.
+void CFreeformPiP::BuildTiles(const Run& run, int32_t y) {
+    constexpr int32_t kBlock = 32;
+    const uint32_t* map =
+        m_pSourceMap.get() + static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth);
+    const size_t rowStart = m_tiles.size();
+    const auto add = [&](int32_t end, uint32_t tile) {
+        if (m_tiles.size() > rowStart && m_tiles.back().tile == tile) {
+            m_tiles.back().end = end;
+        } else {
+            m_tiles.push_back({end, tile});
+        }
+    };
+    uint32_t tile = TileOf(run.first, y);
+    add(run.first + 1, tile);
+    for (int32_t x = run.first; x + 1 < run.end;) {
+        const int32_t last = std::min(x + kBlock, run.end - 1);
+        const uint32_t lastTile = TileOf(last, y);
+        const auto [lowU, highU] = std::minmax(map[x] & 0xFFFF, map[last] & 0xFFFF);
+        const auto [lowV, highV] = std::minmax(map[x] >> 16, map[last] >> 16);
+        bool between = tile == lastTile;
+        for (int32_t i = x + 1; i < last; ++i) {
+            const uint32_t u = map[i] & 0xFFFF;
+            const uint32_t v = map[i] >> 16;
+            between = between && u >= lowU && u <= highU && v >= lowV && v <= highV;
+        }
+        for (int32_t i = x + 1; !between && i < last; ++i) {
+            add(i + 1, TileOf(i, y));
+        }
+        add(last + 1, lastTile);
+        tile = lastTile;
+        x = last;
+    }
 }
 
 bool CFreeformPiP::BeginRows(const CImageARGB& source) {
@@ -131,13 +199,45 @@ bool CFreeformPiP::BeginRows(const CImageARGB& source) {
 }
 
 void CFreeformPiP::DrawRow(int32_t y, uint8_t* row) {
+    const bool wide = IsWide();
+    if (wide && m_bDirty) {
+        m_tileStarts[static_cast<size_t>(y)] = static_cast<uint32_t>(m_tiles.size());
+    }
     for (const Run& run : m_spans.Row(y)) {
         const auto count = static_cast<size_t>(run.end - run.first);
         if (m_bDirty) {
             BuildSpan(run.first, y, count);
+            if (wide) {
+                BuildTiles(run, y);
+            }
         }
-        RenderSpan(row, run.first, y, count);
+        if (!wide) {
+            RenderSpan(row, run.first, y, count);
+        }
     }
+    if (wide) {
+        RenderTiles(row, y);
+    }
+}
+
+void CFreeformPiP::RenderTiles(uint8_t* row, int32_t y) {
+    const SamplePicture whole = m_picture;
+    size_t next = m_tileStarts[static_cast<size_t>(y)];
+    for (const Run& run : m_spans.Row(y)) {
+        for (int32_t x = run.first; x < run.end;) {
+            const TileRun& tile = m_tiles[next++];
+            const auto left = static_cast<int32_t>(tile.tile & 0xFFFF) * kTileSize;
+            const auto top = static_cast<int32_t>(tile.tile >> 16) * kTileSize;
+            m_picture = {whole.pixels + top * whole.pitch + ptrdiff_t{4} * left, whole.pitch,
+                         whole.width - left, whole.height - top};
+            // Area coordinates go half a pixel beyond the picture.
+            if (m_picture.width > 0 && m_picture.height > 0) {
+                RenderSpan(row, x, y, static_cast<size_t>(tile.end - x));
+            }
+            x = tile.end;
+        }
+    }
+    m_picture = whole;
 }
 
 int32_t CFreeformPiP::Render(const CImageARGB& source, CImageARGB& destination) {
@@ -157,6 +257,13 @@ int32_t CFreeformPiP::DrawOn(CImageARGB& destination) {
     if (!destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
         destination.GetHeight() != m_nDestHeight) {
         return 0;
+    }
+    if (IsWide()) { // whose tiles are told by rows
+        for (int32_t y = 0; y < m_nDestHeight; ++y) {
+            DrawRow(y, destination.Row(y));
+        }
+        m_bDirty = false;
+        return 1;
     }
     static const auto withCurrent = [](const RasterPixel& pixel, auto&& draw) {
         CFreeformPiP* const pip = Current();

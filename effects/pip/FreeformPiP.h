@@ -5,6 +5,8 @@
 // through it. Entries are 10.6 fixed point in 16 bits, so of a larger picture only the first 1024
 // columns and rows are reached, and what lies beyond wraps round to them.
 //
+// A wide map is told in addition which 1024 columns and rows those are, for runs of pixels.
+//
 // Render draws a whole image, pixel by pixel through the rasterizer's callback. That is
 // process-wide and works on the object that is the current one; a drawing object makes itself
 // current and holds the rasterizer's lock until it has drawn, so that instances on different
@@ -62,6 +64,9 @@ public:
     void SetQuadModel(int32_t model);
     void SetMapMode(int32_t mode);
     void SetFilterIndex(int32_t index);
+    // A map for pictures of any size, in modes 0 and 2. Without it entries address 1024 columns and
+    // rows.
+    void SetWide(bool wide);
     // Stored, and nothing more.
     void SetOption(int32_t option) { m_nOption = option; }
     int32_t GetOption() const { return m_nOption; }
@@ -104,6 +109,10 @@ private:
     bool Prepare(const KYVImageUtility::CImageARGB* source, InstructionSet set);
     void Allocate();
     void BuildSpan(int32_t x, int32_t y, size_t count);
+    bool IsWide() const;
+    void RenderTiles(uint8_t* row, int32_t y);
+    void BuildTiles(const Run& run, int32_t y);
+    uint32_t TileOf(int32_t x, int32_t y) const;
     void BuildFiltered(int32_t x, int32_t y, size_t count);
     void RenderSpan(uint8_t* row, int32_t x, int32_t y, size_t count);
     size_t EntriesPerPixel() const;
@@ -129,6 +138,16 @@ private:
     std::vector<ContributionRecord> m_records; // mode 4: horizontal and vertical, by pixel
 
     CSpanRows m_spans;
+
+    // A wide map: where in the picture the 1024 columns and rows lie that entries address, by runs
+    // of pixels up to a column.
+    struct TileRun {
+        int32_t end;
+        uint32_t tile; // column in the low 16 bits, row in the high ones, in tiles
+    };
+    bool m_bWide = false;
+    std::vector<TileRun> m_tiles;
+    std::vector<uint32_t> m_tileStarts; // by row of the frame
 
     // While drawing: what to read, for Render where to write, and with which forms.
     SamplePicture m_picture = {};

@@ -90,8 +90,8 @@ struct Bounds {
 
 class CSlowFrame {
 public:
-    CSlowFrame(const Params& params, int width, int height, bool ayuv)
-        : m_p(params), m_width(width), m_height(height), m_ayuv(ayuv) {
+    CSlowFrame(const Params& params, int width, int height, bool ayuv, bool wide = false)
+        : m_p(params), m_width(width), m_height(height), m_ayuv(ayuv), m_wide(wide) {
         m_box = {99999, 99999, -99999, -99999};
         for (int i = 0; i < 4; ++i) {
             m_x[i] = static_cast<int>(params.corners[2 * i] * static_cast<float>(width));
@@ -233,8 +233,9 @@ private:
             const double s = Solve(o * (gx * ey - gy * ex), o * (hg - ef), o * (hx * fy - hy * fx));
             const double t =
                 Solve(-o * (gx * fy - gy * fx), -o * (hg + ef), -o * (hx * ey - hy * ex));
-            const auto u = static_cast<uint16_t>(static_cast<int>(s * m_width * 64));
-            const auto v = static_cast<uint16_t>(static_cast<int>(t * m_height * 64));
+            const int reached = m_wide ? ~0 : 0xFFFF; // 1024 columns and rows
+            const int u = static_cast<int>(s * m_width * 64) & reached;
+            const int v = static_cast<int>(t * m_height * 64) & reached;
             if ((u >> 6) + 1 >= m_width || (v >> 6) + 1 >= m_height) {
                 continue;
             }
@@ -389,6 +390,7 @@ private:
     Params m_p;
     int m_width, m_height;
     bool m_ayuv;
+    bool m_wide;
     int m_x[4], m_y[4];
     Bounds m_box;
 };
@@ -727,6 +729,41 @@ TEST(Freeform, WhatIsKeptIsOutdatedByEveryChange) {
                                            instance.Context().cpuLevel))
                 << "round " << round << " frame " << i;
             instance.Context().cpuLevel = static_cast<int32_t>(random() % 6);
+        }
+    }
+}
+
+// With the option a picture of any size is seen whole; without it an instance goes back to what
+// it was.
+TEST(Freeform, WideMapsReachEveryColumnAndRow) {
+    constexpr std::pair<int, int> kSizes[] = {{2600, 40}, {40, 2600}, {1300, 1100}, {64, 48}};
+    std::mt19937 random(13);
+    for (const auto& [width, height] : kSizes) {
+        const auto pixels = static_cast<size_t>(width * height);
+        const Frame background = RandomFrame(pixels, 1), foreground = RandomFrame(pixels, 2);
+        CTestInstance instance(Pip(), static_cast<uint32_t>(width), static_cast<uint32_t>(height));
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        for (int i = 0; i < (pixels > 1'000'000 ? 2 : 8); ++i) {
+            Params params = RandomParams(random, 0.55F);
+            params.picture = 1;
+            params.pictureBlur = params.borderBlur = params.shadowBlur = 0;
+            if (i == 0) {
+                const float whole[8] = {0, 0, 1, 0, 1, 1, 0, 1};
+                std::copy(whole, whole + 8, params.corners);
+            }
+            Store(params, instance);
+            for (const bool wide : {true, false, true}) {
+                const int32_t level = static_cast<int32_t>(random() % 6);
+                instance.Context().cpuLevel = level + (wide ? CpuLevelOption_WideMap : 0);
+                Frame output(pixels);
+                ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()),
+                          KYV_OK);
+                ASSERT_TRUE(
+                    output ==
+                    CSlowFrame(params, width, height, false, wide).Render(background, foreground))
+                    << width << " x " << height << ", case " << i << ", wide " << wide << ", level "
+                    << level;
+            }
         }
     }
 }

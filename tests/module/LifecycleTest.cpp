@@ -89,6 +89,28 @@ TEST(InitInstance, PictureInPictureHas105ParameterBytes) {
     EXPECT_EQ(ParamBytes(Effect("Kyv_Dsp_Pi_Freeform")), 105U);
 }
 
+// An option beside the level changes nothing but what it is for, which takes larger frames; other
+// upper bits are part of the level, as ever.
+TEST_P(Lifecycle, LevelsHoldBesideAnOption) {
+    constexpr uint32_t kWidth = 50, kHeight = 40;
+    const Frame inputs[2] = {RandomFrame(kWidth * kHeight, 1), RandomFrame(kWidth * kHeight, 2)};
+    const auto render = [&](int32_t level) {
+        CTestInstance instance(effect(), kWidth, kHeight);
+        instance.Context().cpuLevel = level;
+        instance.Context().duration = int64_t{60} * 10'000'000;
+        instance.Context().position = int64_t{20} * 10'000'000;
+        EXPECT_EQ(instance.Begin(), 0U);
+        Frame output(kWidth * kHeight);
+        EXPECT_EQ(instance.Render(output.data(), inputs[0].data(), inputs[1].data()), 0U);
+        return output;
+    };
+    for (const int32_t level : {0, 1, 3, 5}) {
+        EXPECT_EQ(render(CpuLevelOption_WideMap + level), render(level)) << level;
+    }
+    EXPECT_EQ(render(0x4B580001), render(5));
+    EXPECT_EQ(render(-1), render(0));
+}
+
 TEST_P(Lifecycle, SetInputFrameFillsTheLeadingPointers) {
     CTestInstance instance(effect(), 4, 4);
     std::array<void*, 4> frames;
