@@ -20,7 +20,8 @@ enum class ChildStream {
 };
 
 // A running child. Its three streams may be used from three threads; one stream is for one thread
-// at a time. Children do not see the terminal's Ctrl-C: whoever starts them ends them.
+// at a time. They end with the child, even where a program that it has started keeps them open.
+// Children do not see the terminal's Ctrl-C: whoever starts them ends them.
 class CProcess {
 public:
     // Starts a program, found along the search path when its name holds no folder. The arguments
@@ -34,11 +35,12 @@ public:
     CProcess(const CProcess&) = delete;
     CProcess& operator=(const CProcess&) = delete;
 
-    // Up to size bytes of the child's standard output or error; 0 at the end.
+    // Up to size bytes of the child's standard output or error; 0 at the end of the stream, and
+    // when the child has ended and nothing is left to read.
     size_t ReadOutput(void* buffer, size_t size);
     size_t ReadError(void* buffer, size_t size);
 
-    // Writes all to the child's standard input. False when the child no longer reads.
+    // Writes all to the child's standard input. False when the child no longer reads or has ended.
     bool WriteInput(const void* data, size_t size);
 
     // The child sees the end of its standard input.

@@ -82,10 +82,14 @@ public:
     // stack is cleaned up, and a lock that the code it ran had taken stays taken.
     //
     // What must not happen is that it dies inside the allocator or the loader, whose locks the
-    // whole process needs. So the thread is stopped and looked at, over and over: it is ended when
-    // it is in this module's own code, which holds no such lock, or when it has stood still in a
-    // system call for kStillLooks looks and so waits for something that may never come. One that
-    // keeps running through other libraries is ended after kMaxLooks looks all the same.
+    // whole process needs. So the thread is stopped and looked at, over and over, and ended when it
+    // is in this module's own code, which holds no such lock. It is also ended when it seems to
+    // wait for something that may never come, or has kept running through other libraries for
+    // kMaxLooks looks; but a thread that gets no processor looks just like one that waits, and may
+    // hold those locks. Windows: after kStillLooks looks at the same place, and while it is
+    // stopped, another thread must be able to take the locks; only one that keeps them for ten
+    // seconds on end is ended with them. Linux: a look must have interrupted a system call that
+    // waits, kStillLooks times; the C library holds no lock of the allocator in such a call.
     void Terminate();
 
 private:

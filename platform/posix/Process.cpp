@@ -8,7 +8,9 @@
 #include <system_error>
 
 #include <fcntl.h>
+#include <poll.h>
 #include <spawn.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -83,6 +85,7 @@ public:
         fcntl(ends[0], F_SETPIPE_SZ, kPipeBytes); // a wish: a refusal leaves the usual size
         const int childEnd = stream == STDIN_FILENO ? 0 : 1;
         ours = CDescriptor(ends[1 - childEnd]);
+        fcntl(ours.Get(), F_SETFL, O_NONBLOCK);
         theirs = CDescriptor(ends[childEnd]);
         posix_spawn_file_actions_adddup2(&m_actions, theirs.Get(), stream);
     }
@@ -102,26 +105,35 @@ private:
     posix_spawnattr_t m_attributes;
 };
 
-size_t ReadSome(const CDescriptor& from, void* buffer, size_t size) {
-    for (;;) {
-        const ssize_t count = read(from.Get(), buffer, size);
-        if (count >= 0) {
-            return static_cast<size_t>(count);
-        }
-        if (errno != EINTR) {
-            return 0;
-        }
-    }
-}
-
 } // namespace
 
 struct CProcess::State {
     pid_t child = 0;
     CDescriptor input, output, error;
+    CDescriptor lives;
     std::mutex mutex; // guards ended: a process number that has been waited for may be reused
     bool ended = false;
     int exitStatus = 0;
+
+    // Waits until the stream can go on or the child has ended, and says whether it has.
+    bool WaitForStreamOrEnd(const CDescriptor& stream, short event) const {
+        pollfd either[] = {{stream.Get(), event, 0}, {lives.Get(), POLLIN, 0}};
+        return poll(either, 2, -1) > 0 && either[1].revents != 0;
+    }
+
+    size_t Read(const CDescriptor& from, void* buffer, size_t size) const {
+        for (bool childEnded = false;;) {
+            const ssize_t count = read(from.Get(), buffer, size);
+            if (count >= 0) {
+                return static_cast<size_t>(count);
+            }
+            if (errno == EAGAIN && !childEnded) {
+                childEnded = WaitForStreamOrEnd(from, POLLIN);
+            } else if (errno != EINTR) {
+                return 0;
+            }
+        }
+    }
 };
 
 std::filesystem::path ExecutableFile() {
@@ -148,6 +160,8 @@ CProcess::CProcess(const std::string& program, const std::vector<std::string>& a
     }
     list.push_back(nullptr);
     m_pState->child = plan.Start(program.c_str(), list.data());
+    // Without it, on an old kernel, the streams last as long as anybody holds them.
+    m_pState->lives = CDescriptor(static_cast<int>(syscall(SYS_pidfd_open, m_pState->child, 0)));
 }
 
 CProcess::~CProcess() {
@@ -156,25 +170,28 @@ CProcess::~CProcess() {
 }
 
 size_t CProcess::ReadOutput(void* buffer, size_t size) {
-    return ReadSome(m_pState->output, buffer, size);
+    return m_pState->Read(m_pState->output, buffer, size);
 }
 
 size_t CProcess::ReadError(void* buffer, size_t size) {
-    return ReadSome(m_pState->error, buffer, size);
+    return m_pState->Read(m_pState->error, buffer, size);
 }
 
 bool CProcess::WriteInput(const void* data, size_t size) {
     const char* next = static_cast<const char*>(data);
-    while (size > 0) {
+    bool childEnded = false;
+    while (size > 0 && !childEnded) {
         const ssize_t count = write(m_pState->input.Get(), next, size);
         if (count >= 0) {
             next += count;
             size -= static_cast<size_t>(count);
+        } else if (errno == EAGAIN) {
+            childEnded = m_pState->WaitForStreamOrEnd(m_pState->input, POLLOUT);
         } else if (errno != EINTR) {
             return false;
         }
     }
-    return true;
+    return size == 0;
 }
 
 void CProcess::CloseInput() {

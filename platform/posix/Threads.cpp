@@ -4,6 +4,7 @@
 #include <atomic>
 #include <cerrno>
 #include <csetjmp>
+#include <cstring>
 #include <mutex>
 #include <new>
 
@@ -77,6 +78,10 @@ uintptr_t Place(const mcontext_t& machine) {
 uintptr_t Stack(const mcontext_t& machine) {
     return machine.sp;
 }
+int64_t Result(const mcontext_t& machine) {
+    return static_cast<int64_t>(machine.regs[0]);
+}
+constexpr uint8_t kSystemCall[] = {0x01, 0x00, 0x00, 0xD4}; // svc #0
 #else
 uintptr_t Place(const mcontext_t& machine) {
     return static_cast<uintptr_t>(machine.gregs[REG_RIP]);
@@ -84,7 +89,22 @@ uintptr_t Place(const mcontext_t& machine) {
 uintptr_t Stack(const mcontext_t& machine) {
     return static_cast<uintptr_t>(machine.gregs[REG_RSP]);
 }
+int64_t Result(const mcontext_t& machine) {
+    return machine.gregs[REG_RAX];
+}
+constexpr uint8_t kSystemCall[] = {0x0F, 0x05}; // syscall
 #endif
+
+// Whether the signal came in the middle of a system call that waits: it has returned EINTR just
+// now. One that does not, such as those of the allocator, ends before the signal is delivered, and
+// with another result.
+bool HasInterruptedWait(const mcontext_t& machine) {
+    const uintptr_t place = Place(machine);
+    const uint8_t* next;
+    std::memcpy(&next, &place, sizeof next);
+    return Result(machine) == -EINTR &&
+           std::memcmp(next - sizeof kSystemCall, kSystemCall, sizeof kSystemCall) == 0;
+}
 
 // True when the signal reaches a thread. An emulator keeps some for itself, which the process may
 // claim but not send; one is sent to this thread, which blocks it meanwhile and takes it back.
@@ -203,11 +223,13 @@ struct CThread::State {
     // For Terminate. The handler answers every signal by setting looked, unless it jumps.
     sigjmp_buf leave;
     std::atomic<bool> inside = false; // entry runs, so leave may be taken
-    std::atomic<bool> force = false;
+    std::atomic<bool> endWaiting = false;
+    std::atomic<bool> endAnywhere = false;
     const CodeRange ownCode = OwnCode();
     CEvent looked;
     std::atomic<uintptr_t> place = 0;
     std::atomic<uintptr_t> stack = 0;
+    std::atomic<bool> waits = false;
 
     static void* Main(void* argument) {
         auto* self = static_cast<State*>(argument);
@@ -228,12 +250,15 @@ struct CThread::State {
         const int savedErrno = errno;
         auto* self = static_cast<State*>(info->si_value.sival_ptr);
         const mcontext_t& machine = static_cast<ucontext_t*>(context)->uc_mcontext;
-        if (self->inside && (self->force || self->ownCode.Contains(Place(machine)))) {
+        const bool waits = HasInterruptedWait(machine);
+        if (self->inside && (self->ownCode.Contains(Place(machine)) ||
+                             (waits && self->endWaiting) || self->endAnywhere)) {
             self->inside = false;
             siglongjmp(self->leave, 1);
         }
         self->place = Place(machine);
         self->stack = Stack(machine);
+        self->waits = waits;
         self->looked.Set();
         errno = savedErrno;
     }
@@ -280,7 +305,7 @@ void CThread::Terminate() {
     struct sigaction action = {};
     struct sigaction previous;
     action.sa_sigaction = State::OnStopSignal;
-    action.sa_flags = SA_SIGINFO | SA_RESTART;
+    action.sa_flags = SA_SIGINFO; // and no SA_RESTART, which would hide what was interrupted
     sigfillset(&action.sa_mask);
     sigaction(StopSignal(), &action, &previous);
 
@@ -301,10 +326,12 @@ void CThread::Terminate() {
         asked = false;
         const uintptr_t place = m_pState->place;
         const uintptr_t stack = m_pState->stack;
-        still = place == lastPlace && stack == lastStack ? still + 1 : 0;
+        const bool sameWait = m_pState->waits && place == lastPlace && stack == lastStack;
+        still = sameWait ? still + 1 : 0;
         lastPlace = place;
         lastStack = stack;
-        m_pState->force = still >= kStillLooks || look >= kMaxLooks;
+        m_pState->endWaiting = still >= kStillLooks;
+        m_pState->endAnywhere = look >= kMaxLooks;
     }
     // A signal that came while the thread was leaving dies with the thread.
     pthread_join(m_pState->thread, nullptr);

@@ -2,6 +2,7 @@
 #include "platform/Process.h"
 
 #include <algorithm>
+#include <atomic>
 #include <mutex>
 #include <system_error>
 
@@ -62,35 +63,68 @@ std::wstring Quote(const std::wstring& argument) {
     return quoted + L'"';
 }
 
-// The child's end of a stream is inheritable, ours is not.
-void Connect(ChildStream kind, bool isInput, CHandle& ours, CHandle& theirs) {
+// Our end of a stream. What is read or written is waited for together with the child's end, which
+// takes a pipe with a name: those without do not know such operations.
+struct Stream {
+    CHandle pipe;
+    CHandle done; // the event of the operation under way
+};
+
+// The child's end is inheritable, ours is not.
+void Connect(ChildStream kind, bool isInput, Stream& ours, CHandle& theirs) {
     SECURITY_ATTRIBUTES inherit = {sizeof inherit, nullptr, TRUE};
-    if (kind == ChildStream::Null) {
-        theirs = CHandle(CreateFileW(L"NUL", isInput ? GENERIC_READ : GENERIC_WRITE,
-                                     FILE_SHARE_READ | FILE_SHARE_WRITE, &inherit, OPEN_EXISTING, 0,
-                                     nullptr));
-        return;
+    std::wstring name = L"NUL";
+    if (kind == ChildStream::Pipe) {
+        static std::atomic<uint32_t> pipes;
+        name = L"\\\\.\\pipe\\kyv-" + std::to_wstring(GetCurrentProcessId()) + L'-' +
+               std::to_wstring(++pipes);
+        ours.pipe = CHandle(CreateNamedPipeW(
+            name.c_str(),
+            (isInput ? PIPE_ACCESS_OUTBOUND : PIPE_ACCESS_INBOUND) | FILE_FLAG_OVERLAPPED |
+                FILE_FLAG_FIRST_PIPE_INSTANCE,
+            PIPE_TYPE_BYTE | PIPE_REJECT_REMOTE_CLIENTS, 1, kPipeBytes, kPipeBytes, 0, nullptr));
+        ours.done = CHandle(CreateEventW(nullptr, TRUE, FALSE, nullptr));
+        if (ours.pipe.Get() == INVALID_HANDLE_VALUE || !ours.done.Get()) {
+            Fail("pipe");
+        }
     }
-    HANDLE readEnd = nullptr;
-    HANDLE writeEnd = nullptr;
-    if (!CreatePipe(&readEnd, &writeEnd, &inherit, kPipeBytes)) {
+    theirs = CHandle(CreateFileW(name.c_str(), isInput ? GENERIC_READ : GENERIC_WRITE,
+                                 FILE_SHARE_READ | FILE_SHARE_WRITE, &inherit, OPEN_EXISTING, 0,
+                                 nullptr));
+    if (theirs.Get() == INVALID_HANDLE_VALUE) {
         Fail("pipe");
     }
-    ours = CHandle(isInput ? writeEnd : readEnd);
-    theirs = CHandle(isInput ? readEnd : writeEnd);
-    SetHandleInformation(ours.Get(), HANDLE_FLAG_INHERIT, 0);
-}
-
-size_t ReadSome(const CHandle& from, void* buffer, size_t size) {
-    DWORD count = 0;
-    const auto wanted = static_cast<DWORD>(std::min(size, kPieceBytes));
-    return ReadFile(from.Get(), buffer, wanted, &count, nullptr) ? count : 0;
 }
 
 } // namespace
 
 struct CProcess::State {
-    CHandle child, input, output, error;
+    CHandle child;
+    Stream input, output, error;
+
+    // Reads or writes once, as the operation says. The bytes moved: 0 when the other side has
+    // closed the stream, and when the child has ended and the operation still cannot go on.
+    template <class Operation>
+    DWORD Transfer(const Stream& stream, Operation operation) const {
+        OVERLAPPED transfer = {};
+        transfer.hEvent = stream.done.Get();
+        if (!operation(stream.pipe.Get(), &transfer) && GetLastError() != ERROR_IO_PENDING) {
+            return 0;
+        }
+        const HANDLE either[] = {transfer.hEvent, child.Get()}; // the first that is set decides
+        if (WaitForMultipleObjects(2, either, FALSE, INFINITE) != WAIT_OBJECT_0) {
+            CancelIoEx(stream.pipe.Get(), &transfer);
+        }
+        DWORD count = 0;
+        return GetOverlappedResult(stream.pipe.Get(), &transfer, &count, TRUE) ? count : 0;
+    }
+
+    size_t Read(const Stream& from, void* buffer, size_t size) const {
+        const auto wanted = static_cast<DWORD>(std::min(size, kPieceBytes));
+        return Transfer(from, [=](HANDLE pipe, OVERLAPPED* transfer) {
+            return ReadFile(pipe, buffer, wanted, nullptr, transfer);
+        });
+    }
 };
 
 std::filesystem::path ExecutableFile() {
@@ -137,19 +171,22 @@ CProcess::~CProcess() {
 }
 
 size_t CProcess::ReadOutput(void* buffer, size_t size) {
-    return ReadSome(m_pState->output, buffer, size);
+    return m_pState->Read(m_pState->output, buffer, size);
 }
 
 size_t CProcess::ReadError(void* buffer, size_t size) {
-    return ReadSome(m_pState->error, buffer, size);
+    return m_pState->Read(m_pState->error, buffer, size);
 }
 
 bool CProcess::WriteInput(const void* data, size_t size) {
     const char* next = static_cast<const char*>(data);
     while (size > 0) {
-        DWORD count = 0;
         const auto wanted = static_cast<DWORD>(std::min(size, kPieceBytes));
-        if (!WriteFile(m_pState->input.Get(), next, wanted, &count, nullptr)) {
+        const DWORD count =
+            m_pState->Transfer(m_pState->input, [=](HANDLE pipe, OVERLAPPED* transfer) {
+                return WriteFile(pipe, next, wanted, nullptr, transfer);
+            });
+        if (count == 0) {
             return false;
         }
         next += count;
@@ -159,7 +196,7 @@ bool CProcess::WriteInput(const void* data, size_t size) {
 }
 
 void CProcess::CloseInput() {
-    m_pState->input.Close();
+    m_pState->input.pipe.Close();
 }
 
 void CProcess::Kill() {

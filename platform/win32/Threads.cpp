@@ -1,6 +1,7 @@
 // Threads, events and locks on Windows.
 #include "platform/Threads.h"
 
+#include <cstdlib>
 #include <new>
 
 #include <windows.h>
@@ -73,6 +74,57 @@ struct CThread::State {
     }
 };
 
+namespace {
+
+constexpr int kMaxTrials = 10; // failed ones, a second each, until the thread is ended all the same
+
+// Whether the locks that every thread needs are free at this moment. A thread begins and ends under
+// the loader's lock and takes the allocators' in between, so one that has ended has had them all.
+class CLockTrial {
+public:
+    // Nothing happens before Passes. Without a thread to be had, or without need, it passes.
+    explicit CLockTrial(bool needed)
+        : m_thread(needed ? CreateThread(nullptr, 0, TakeLocks, nullptr, CREATE_SUSPENDED, nullptr)
+                          : nullptr) {}
+
+    // Waits for the end of the trial as long as the locks are taken, though not for ever.
+    ~CLockTrial() {
+        if (m_thread) {
+            ResumeThread(m_thread);
+            WaitForSingleObject(m_thread, kPatienceMs);
+            CloseHandle(m_thread);
+        }
+    }
+    CLockTrial(const CLockTrial&) = delete;
+    CLockTrial& operator=(const CLockTrial&) = delete;
+
+    bool Passes() const {
+        if (!m_thread) {
+            return true;
+        }
+        ResumeThread(m_thread);
+        return WaitForSingleObject(m_thread, kTrialMs) == WAIT_OBJECT_0;
+    }
+
+private:
+    static constexpr DWORD kTrialMs = 50;
+    static constexpr DWORD kPatienceMs = 1000;
+    static constexpr size_t kBlockBytes = 100000; // no small one, which may be had without a lock
+
+    static DWORD WINAPI TakeLocks(LPVOID) {
+        const HANDLE heap = GetProcessHeap();
+        HeapLock(heap);
+        HeapUnlock(heap);
+        void* volatile block = std::malloc(kBlockBytes); // perhaps from a heap of the runtime's own
+        std::free(block);
+        return 0;
+    }
+
+    const HANDLE m_thread;
+};
+
+} // namespace
+
 CThread::~CThread() {
     if (m_pState) {
         WaitForSingleObject(m_pState->handle, INFINITE);
@@ -107,15 +159,19 @@ void CThread::Terminate() {
     DWORD64 lastPlace = 0;
     DWORD64 lastStack = 0;
     int still = 0;
-    for (int look = 0; look < kMaxLooks && still < kStillLooks; ++look) {
+    for (int look = 0;; ++look) {
         if (Wait(look == 0 ? 0 : 1)) {
             return;
         }
+        // Created before the thread is stopped, because that may need a lock which the thread has.
+        const bool due = still >= kStillLooks || look >= kMaxLooks;
+        CLockTrial trial(due);
         SuspendThread(handle);
         CONTEXT context = {};
         context.ContextFlags = CONTEXT_CONTROL;
         if (GetThreadContext(handle, &context)) { // waits until the thread has stopped
-            if (State::IsOwnCode(context.Rip)) {
+            if (State::IsOwnCode(context.Rip) ||
+                (due && (trial.Passes() || look >= kMaxLooks + kMaxTrials))) {
                 TerminateThread(handle, 0);
             }
             still = context.Rip == lastPlace && context.Rsp == lastStack ? still + 1 : 0;
@@ -124,8 +180,6 @@ void CThread::Terminate() {
         }
         ResumeThread(handle);
     }
-    TerminateThread(handle, 0);
-    WaitForSingleObject(handle, INFINITE);
 }
 
 uint32_t ProcessorCount() {
