@@ -49,12 +49,16 @@ enum {
     kKyvFormatNumber = 11, // ModuleDescriptor::formatNumber of this interface
 };
 
-// The statuses that exports and callbacks return.
+// The statuses that exports and callbacks return; there are no others.
 #define KYV_OK ((KyvStatus)0x00000000u)
-#define KYV_ABORTED ((KyvStatus)0x80004004u)          // a job was cancelled
-#define KYV_FAIL ((KyvStatus)0x80004005u)             // null context, missing frame or resource
+// A null context, a missing frame, size or resource, or an allocation that failed.
+#define KYV_FAIL ((KyvStatus)0x80004005u)
+
+// Codes of the same convention that stay inside the module, where the worker pool reports them. No
+// export and no callback returns one; programs round the module may use them as they like.
 #define KYV_NULL_POINTER ((KyvStatus)0x80004003u)     // a required pointer was null
-#define KYV_OUT_OF_MEMORY ((KyvStatus)0x8007000Eu)    // an allocation failed
+#define KYV_ABORTED ((KyvStatus)0x80004004u)          // a job was cancelled
+#define KYV_OUT_OF_MEMORY ((KyvStatus)0x8007000Eu)    // no memory, or no thread to be had
 #define KYV_INVALID_ARGUMENT ((KyvStatus)0x80070057u) // an argument was not acceptable
 #define KYV_WAIT_TIMEOUT ((KyvStatus)0xE0000102u)     // a wait ran out of time
 
