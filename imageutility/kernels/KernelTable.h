@@ -31,13 +31,6 @@
     .avx512 = avx512::name
 #endif
 
-// Wraps the name of a vector form in a table, so that a build without vector files links.
-#ifdef KYV_NO_VECTOR_KERNELS
-#define KYV_VECTOR_FORM(name) nullptr
-#else
-#define KYV_VECTOR_FORM(name) name
-#endif
-
 namespace kyv {
 
 // One bit a set, for KernelTable::passedOver.
