@@ -3,14 +3,12 @@
 
 #include <algorithm>
 #include <array>
-#include <cstdio>
-#include <cstdlib>
 #include <cstring>
-#include <filesystem>
 #include <memory>
 
-#include "interface/HostInterface.h"
-#include "platform/Library.h"
+#include "hosting/Instance.h"
+#include "hosting/Module.h"
+#include "hosting/Names.h"
 
 namespace kyvbench {
 namespace {
@@ -96,107 +94,50 @@ const EffectCase kCases[] = {
 
 constexpr int64_t kFrameTime = 10'000'000 / 30; // 100 ns units
 
-const ModuleDescriptor& LoadModule() {
-    static const ModuleDescriptor* const module = [] {
-        const kyv::LibraryHandle library =
-            kyv::OpenLibrary(std::filesystem::path(KYV_MODULE_FILE).native());
-        const auto init =
-            reinterpret_cast<KyvInitModuleFunction>(kyv::FindSymbol(library, KYV_INIT_MODULE_NAME));
-        ModuleDescriptor* descriptor = nullptr;
-        if (!init || init(&descriptor) != KYV_OK) {
-            std::fprintf(stderr, "kyv_bench: cannot load %s\n", KYV_MODULE_FILE);
-            std::exit(1);
-        }
-        return descriptor;
-    }();
-    return *module;
-}
-
-const EffectDescriptor* FindEffect(const std::string& identifier) {
-    const ModuleDescriptor& module = LoadModule();
-    const auto* end = module.effects + module.effectCount;
-    const auto* found = std::find_if(module.effects, end, [&](const EffectDescriptor& effect) {
-        return effect.identifier == identifier;
-    });
-    return found == end ? nullptr : found;
+const EffectDescriptor* FindEffect(const char* identifier) {
+    static const kyvhosting::CModule module(KYV_MODULE_FILE);
+    return kyvhosting::EffectOf(module.Descriptor(), identifier);
 }
 
 // An instance that plays on with every frame.
 class CPlayer {
 public:
     CPlayer(const EffectDescriptor& effect, const EffectCase& what, uint32_t format, int32_t level)
-        : m_effect(effect), m_settings(what.settings), m_alternate(what.alternate),
-          m_data((effect.instanceDataSize + 7) / 8) {
-        size_t size = 0;
-        for (uint32_t i = 0; i < effect.paramCount; ++i) {
-            size += effect.params[i].valueSize;
-        }
-        m_params.resize(size);
-        m_context.descriptor = &effect;
-        m_context.instanceData = m_data.data();
-        m_context.params = m_params.data();
-        m_context.width = kWidth;
-        m_context.height = kHeight;
-        m_context.pixelFormat = format;
-        m_context.cpuLevel = level;
-        m_context.threadCount = what.threads;
-        m_context.position = int64_t{what.startMs} * 10'000;
-        m_context.duration = int64_t{3600} * 10'000'000; // never played to its end
-        m_ready = effect.callbacks.InitInstance(&m_context) == KYV_OK;
-        for (const auto* settings : {&m_settings, &m_alternate}) {
-            for (const Setting& setting : *settings) {
-                m_ready = m_ready && Set(setting);
-            }
-        }
-        m_ready = m_ready && effect.callbacks.BeginProcessing(&m_context) == KYV_OK && Play();
+        : m_settings(what.settings), m_alternate(what.alternate), m_instance(effect) {
+        EffectContext& context = m_instance.Context();
+        context.width = kWidth;
+        context.height = kHeight;
+        context.pixelFormat = format;
+        context.cpuLevel = level;
+        context.threadCount = what.threads;
+        context.position = int64_t{what.startMs} * 10'000;
+        context.duration = int64_t{3600} * 10'000'000; // never played to its end
+        m_ready = m_instance.Init() == KYV_OK && Set(m_settings) && Set(m_alternate) &&
+                  m_instance.Begin() == KYV_OK && Play();
     }
-
-    ~CPlayer() {
-        m_effect.callbacks.EndProcessing(&m_context);
-        m_effect.callbacks.DestroyInstance(&m_context);
-    }
-
-    CPlayer(const CPlayer&) = delete;
-    CPlayer& operator=(const CPlayer&) = delete;
 
     // False when the effect refused a setting or its first frame.
     bool IsReady() const { return m_ready; }
 
     bool Play() {
-        for (const Setting& setting : m_frame++ % 2 ? m_alternate : m_settings) {
-            Set(setting);
-        }
+        Set(m_frame++ % 2 ? m_alternate : m_settings);
         Frames& frames = SharedFrames();
-        for (uint32_t i = 0; i < m_effect.properties.inputCount; ++i) {
-            m_context.frame = frames.source[i].data();
-            m_effect.callbacks.SetInputFrame(i, &m_context);
-        }
-        m_context.frame = frames.target.data();
-        const KyvStatus status = m_effect.callbacks.ProcessFrame(&m_context);
-        m_context.position += kFrameTime;
+        const KyvStatus status = m_instance.Render(frames.target.data(), frames.source[0].data(),
+                                                   frames.source[1].data());
+        m_instance.Context().position += kFrameTime;
         return status == KYV_OK;
     }
 
 private:
-    bool Set(const Setting& setting) {
-        uint8_t* value = m_params.data();
-        for (uint32_t i = 0; i < m_effect.paramCount; ++i) {
-            const ParamDescriptor& param = m_effect.params[i];
-            if (param.key == setting.key) {
-                std::copy(setting.bytes.begin(), setting.bytes.end(), value);
-                return param.valueSize == setting.bytes.size();
-            }
-            value += param.valueSize;
-        }
-        return false;
+    bool Set(const std::vector<Setting>& settings) {
+        return std::all_of(settings.begin(), settings.end(), [this](const Setting& setting) {
+            return m_instance.SetBytes(setting.key, setting.bytes.data(), setting.bytes.size());
+        });
     }
 
-    const EffectDescriptor& m_effect;
     const std::vector<Setting>& m_settings;
     const std::vector<Setting>& m_alternate;
-    EffectContext m_context = {};
-    std::vector<uint64_t> m_data;
-    std::vector<uint8_t> m_params;
+    kyvhosting::CInstance m_instance;
     uint32_t m_frame = 0;
     bool m_ready;
 };

@@ -19,7 +19,7 @@ HostNotification g_notification = {&kNotificationTable};
 } // namespace
 
 CInstance::CInstance(const EffectDescriptor& effect)
-    : m_data(new uint64_t[effect.instanceDataSize / 8 + 1]()) {
+    : m_data(new uint64_t[(effect.instanceDataSize + 7) / 8]()) {
     size_t size = 0;
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
         m_offsets.push_back(size);
@@ -71,6 +71,7 @@ KyvStatus CInstance::End() {
 
 KyvStatus CInstance::Destroy() {
     m_bInitialised = false;
+    m_bBegun = false; // it does EndProcessing's work too
     return Effect().callbacks.DestroyInstance(&m_context);
 }
 

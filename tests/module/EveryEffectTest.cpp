@@ -29,15 +29,6 @@ Frame Scene(uint32_t width, uint32_t height, uint32_t seed) {
     return frame;
 }
 
-// The bytes of a parameter's value.
-uint8_t* ValueOf(CTestInstance& instance, uint32_t index) {
-    size_t offset = 0;
-    for (uint32_t i = 0; i < index; ++i) {
-        offset += instance.Descriptor().params[i].valueSize;
-    }
-    return instance.Params().data() + offset;
-}
-
 class EveryEffect : public testing::TestWithParam<uint32_t> {
 protected:
     const EffectDescriptor& effect() const { return Module().effects[GetParam()]; }
@@ -51,11 +42,11 @@ protected:
                 std::memcpy(&value, param.defaultValue, sizeof value);
                 std::memcpy(&maximum, param.maximum, sizeof maximum);
                 value = static_cast<T>(value + (maximum - value) / 2);
-                std::memcpy(ValueOf(instance, i), &value, sizeof value);
+                std::memcpy(instance.Value(i), &value, sizeof value);
             };
             if (param.type == ParamType_Color) {
                 const uint32_t orange = 0x2070E0;
-                std::memcpy(ValueOf(instance, i), &orange, sizeof orange);
+                std::memcpy(instance.Value(i), &orange, sizeof orange);
             } else if (param.type == ParamType_Float) {
                 half(0.0F, 0.0F);
             } else if (param.type == ParamType_Byte) {
@@ -205,8 +196,7 @@ TEST_P(EveryEffect, HostileValuesAreBounded) {
             for (uint32_t i = 0; i < effect().paramCount; ++i) {
                 const size_t size = effect().params[i].valueSize;
                 for (size_t at = 0; at + 4 <= size && random() % 3; at += 4) {
-                    std::memcpy(ValueOf(instance, i) + at, &kValues[random() % std::size(kValues)],
-                                4);
+                    std::memcpy(instance.Value(i) + at, &kValues[random() % std::size(kValues)], 4);
                 }
             }
             context.position = kTimes[random() % std::size(kTimes)];

@@ -1,14 +1,12 @@
 // A host for tests: loads the built module as a user's host would and drives effects through the
-// public header alone.
+// public header alone. What hosts have in common is hosting/; here are the tests' guards.
 #pragma once
 
 #include <cstdint>
-#include <cstring>
-#include <memory>
 #include <string>
 #include <vector>
 
-#include "interface/HostInterface.h"
+#include "hosting/Instance.h"
 
 namespace kyvtest {
 
@@ -22,41 +20,22 @@ const EffectDescriptor& Effect(const char* identifier);
 
 using Frame = std::vector<uint32_t>; // pixels as words: 0xAARRGGBB or 0xAAYYUUVV
 
-// An instance with everything that a host owns. The frames' guards are the caller's affair.
-class CTestInstance {
+// An instance that fails the test where one of a lenient host would go on. The frames' guards are
+// the caller's affair.
+class CTestInstance : public kyvhosting::CInstance {
 public:
     // Calls InitInstance. Width and height are those of one view.
     CTestInstance(const EffectDescriptor& effect, uint32_t width, uint32_t height);
-    ~CTestInstance(); // calls DestroyInstance
-
-    CTestInstance(const CTestInstance&) = delete;
-    CTestInstance& operator=(const CTestInstance&) = delete;
-
-    EffectContext& Context() { return m_context; }
-    std::vector<uint8_t>& Params() { return m_params; }
-    const EffectDescriptor& Descriptor() const { return *m_context.descriptor; }
+    ~CTestInstance(); // DestroyInstance alone, which must release all that was prepared
 
     // Stores a value under its key, such as "P1"; its size must be the declared one.
     template <class T>
     void Set(const char* key, T value) {
-        SetBytes(key, &value, sizeof value);
+        SetOrFail(key, &value, sizeof value);
     }
 
-    KyvStatus Begin() { return Call(Descriptor().callbacks.BeginProcessing); }
-    KyvStatus End() { return Call(Descriptor().callbacks.EndProcessing); }
-    KyvStatus SetInput(uint32_t index, const void* frame);
-    KyvStatus Process(void* output);
-
-    // SetInputFrame and ProcessFrame, with the frame sizes left to the caller.
-    KyvStatus Render(void* output, const void* input0, const void* input1 = nullptr);
-
 private:
-    KyvStatus Call(EffectCallback callback) { return callback(&m_context); }
-    void SetBytes(const char* key, const void* value, size_t size);
-
-    EffectContext m_context = {};
-    std::unique_ptr<uint64_t[]> m_data; // aligned as a host's allocator aligns
-    std::vector<uint8_t> m_params;
+    void SetOrFail(const char* key, const void* value, size_t size);
 };
 
 // Deterministic bytes.
