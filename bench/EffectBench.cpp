@@ -72,6 +72,8 @@ const EffectCase kCases[] = {
      PictureOnly(0.25F, 0.25F, 0.75F, 0.75F),
      0,
      {{"P0", 0.26F}}},
+    {"pip defaults", "Kyv_Dsp_Pi_Freeform"},
+    {"pip defaults moving", "Kyv_Dsp_Pi_Freeform", {{"P0", 0.25F}}, 0, {{"P0", 0.26F}}},
     {"pip all", "Kyv_Dsp_Pi_Freeform", PictureWithAll()},
     {"pip all moving", "Kyv_Dsp_Pi_Freeform", PictureWithAll(), 0, {{"P0", 0.11F}}},
     {"alpha transition", "DSP_TR_AlphaTransition", {{"P1", 0.5F}}},

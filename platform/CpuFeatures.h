@@ -27,9 +27,8 @@ const ProcessorFeatures& GetProcessorFeatures();
 InstructionSet ProcessorInstructionSet(const ProcessorFeatures& features);
 InstructionSet ProcessorInstructionSet();
 
-// The set for a host level on a processor: below 3 scalar, 3 SSE2,
-// from 4 the best that it has. The level is a ceiling, so one set too high cannot reach a missing
-// instruction.
+// The set for a host level on a processor: below 3 scalar, 3 SSE2, from 4 the best that it has. The
+// level is a ceiling, so one set too high cannot reach a missing instruction.
 InstructionSet Resolve(int32_t cpuLevel, const ProcessorFeatures& features);
 InstructionSet Resolve(int32_t cpuLevel);
 

@@ -1,8 +1,7 @@
 // The picture of one frame, made row by row: drawn through the quad's map, keyed, blurred.
 //
-// Reads the foreground; row y of the result needs no row of it in order. Drawing, keying (which
-// looks at the row below) and blurring (at `blur` rows to either side) follow each other so closely
-// that the nearest caches still have the rows.
+// Drawing reads the foreground, any row of it. Keying looks at the row below and blurring at `blur`
+// rows to either side; they follow so closely that the nearest caches still have the rows.
 #pragma once
 
 #include <cstdint>
@@ -34,12 +33,11 @@ struct PictureSettings {
 
 class CPictureRows {
 public:
-    // A frame follows. Throws std::bad_alloc, as do the others. False when there is nothing to
-    // draw.
+    // A frame follows. Throws std::bad_alloc, as do the others.
     void Begin(CFreeformPiP& pip, const KYVImageUtility::CImageARGB& foreground,
                const PictureSettings& settings);
 
-    // Makes all rows down to y, but for the blur; frameward of that nothing is done again.
+    // Makes all rows down to y that are not made yet, but for the blur.
     void MakeTo(int32_t y);
 
     // Blends row y, all of which come in order, over the frame's row.
