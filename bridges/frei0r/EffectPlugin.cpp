@@ -69,7 +69,8 @@ CEffectPlugin::CEffectPlugin(const PluginTable& table, const EffectDescriptor& e
     EffectContext& context = m_instance.Context();
     context.width = width;
     context.height = height;
-    context.cpuLevel = CpuLevel_Avx2; // a ceiling: the processor decides below it
+    // A ceiling: the processor decides below it. Pictures of any size are shown whole.
+    context.cpuLevel = int32_t{CpuLevel_Avx2} | int32_t{CpuLevelOption_WideMap};
     kyvhosting::Require(m_instance.Init(), effect, "InitInstance");
     for (int i = 0; i < table.paramCount; ++i) {
         if (table.params[i].ownDefault) {

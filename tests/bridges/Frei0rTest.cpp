@@ -52,7 +52,7 @@ const EffectDescriptor& EffectOf(const std::string& plugin) {
 // The frame as the module renders it for a host of its own.
 Frame RenderByModule(CTestInstance& instance, double seconds, const Frame& a, const Frame& b) {
     Frame output(a.size(), 0xCDCDCDCD);
-    instance.Context().cpuLevel = CpuLevel_Avx2;
+    instance.Context().cpuLevel = int32_t{CpuLevel_Avx2} | int32_t{CpuLevelOption_WideMap};
     instance.Context().position = static_cast<int64_t>(std::floor(seconds * 1e7));
     EXPECT_EQ(instance.Begin(), KYV_OK);
     EXPECT_EQ(instance.Render(output.data(), a.data(), b.data()), KYV_OK);
