@@ -159,9 +159,12 @@ uint32_t CFreeformPiP::TileOf(int32_t x, int32_t y) const {
 }
 
 // Of a block that begins and ends in one tile all pixels are in it when their entries lie between
-// those at its ends; of others every pixel is asked.
+// those at its ends, or a few pixels of the picture beyond: such a pixel in another tile would be
+// nearly 1024 away. Of other blocks every pixel is asked.
 void CFreeformPiP::BuildTiles(const Run& run, int32_t y) {
     constexpr int32_t kBlock = 32;
+    constexpr uint32_t kSlack = 4 * 64; // of entries
+    constexpr uint32_t kHighest = 0xFFFF - kSlack;
     const uint32_t* map =
         m_pSourceMap.get() + static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth);
     const size_t rowStart = m_tiles.size();
@@ -179,11 +182,13 @@ void CFreeformPiP::BuildTiles(const Run& run, int32_t y) {
         const uint32_t lastTile = TileOf(last, y);
         const auto [lowU, highU] = std::minmax(map[x] & 0xFFFF, map[last] & 0xFFFF);
         const auto [lowV, highV] = std::minmax(map[x] >> 16, map[last] >> 16);
-        bool between = tile == lastTile;
+        bool between = tile == lastTile && lowU >= kSlack && lowV >= kSlack && highU <= kHighest &&
+                       highV <= kHighest;
         for (int32_t i = x + 1; i < last; ++i) {
             const uint32_t u = map[i] & 0xFFFF;
             const uint32_t v = map[i] >> 16;
-            between = between && u >= lowU && u <= highU && v >= lowV && v <= highV;
+            between = between && u + kSlack >= lowU && u <= highU + kSlack && v + kSlack >= lowV &&
+                      v <= highV + kSlack;
         }
         for (int32_t i = x + 1; !between && i < last; ++i) {
             add(i + 1, TileOf(i, y));
