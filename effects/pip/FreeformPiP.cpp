@@ -180,8 +180,8 @@ void CFreeformPiP::BuildTiles(const Run& run, int32_t y) {
     for (int32_t x = run.first; x + 1 < run.end;) {
         const int32_t last = std::min(x + kBlock, run.end - 1);
         const uint32_t lastTile = TileOf(last, y);
-        const auto [lowU, highU] = std::minmax(map[x] & 0xFFFF, map[last] & 0xFFFF);
-        const auto [lowV, highV] = std::minmax(map[x] >> 16, map[last] >> 16);
+        const auto [lowU, highU] = std::minmax({map[x] & 0xFFFF, map[last] & 0xFFFF});
+        const auto [lowV, highV] = std::minmax({map[x] >> 16, map[last] >> 16});
         bool between = tile == lastTile && lowU >= kSlack && lowV >= kSlack && highU <= kHighest &&
                        highV <= kHighest;
         for (int32_t i = x + 1; i < last; ++i) {
