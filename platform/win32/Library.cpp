@@ -3,8 +3,9 @@
 
 #include <windows.h>
 
-// The first byte of the image that this file is linked into; its address is the handle.
-extern "C" IMAGE_DOS_HEADER __ImageBase;
+// The first byte of the image that this file is linked into; its address is the handle. The
+// linker chose the name.
+extern "C" IMAGE_DOS_HEADER __ImageBase; // NOLINT(bugprone-reserved-identifier)
 
 namespace kyv {
 

@@ -6,8 +6,8 @@
 
 #include <windows.h>
 
-// The start of this module's image in memory, from the linker.
-extern "C" IMAGE_DOS_HEADER __ImageBase;
+// The start of this module's image in memory. The linker chose the name.
+extern "C" IMAGE_DOS_HEADER __ImageBase; // NOLINT(bugprone-reserved-identifier)
 
 namespace kyv {
 
@@ -67,7 +67,9 @@ struct CThread::State {
     }
 
     static bool IsOwnCode(DWORD64 address) {
+        // In integers: to the compiler the object is its 64 bytes and not the image.
         const auto base = reinterpret_cast<DWORD64>(&__ImageBase);
+        // NOLINTNEXTLINE(performance-no-int-to-ptr)
         const auto* headers = reinterpret_cast<const IMAGE_NT_HEADERS*>(
             base + static_cast<DWORD64>(__ImageBase.e_lfanew));
         return address - base < headers->OptionalHeader.SizeOfImage;
