@@ -3,9 +3,9 @@
 #include <cstdlib>
 #include <vector>
 
+#include "host/ExitStatus.h"
 #include "host/Picture.h"
 #include "host/PictureFile.h"
-#include "hosting/ExitStatus.h"
 #include "platform/posix/ImageCodecs.h"
 
 namespace {
