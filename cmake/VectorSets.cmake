@@ -27,4 +27,6 @@ if(CMAKE_SYSTEM_PROCESSOR MATCHES "^(x86_64|AMD64)$")
         target_compile_options(kyv_kernels_avx512 PRIVATE -Wno-uninitialized
                                -Wno-maybe-uninitialized)
     endif()
+elseif(CMAKE_SYSTEM_PROCESSOR STREQUAL "aarch64")
+    kyv_vector_set(neon)
 endif()

@@ -14,6 +14,8 @@ ProcessorFeatures Detect() {
             .avx512bw = __builtin_cpu_supports("avx512bw") != 0,
             .avx512dq = __builtin_cpu_supports("avx512dq") != 0,
             .avx512vl = __builtin_cpu_supports("avx512vl") != 0};
+#elif defined(__aarch64__)
+    return {.neon = true}; // part of the architecture
 #else
     return {};
 #endif
@@ -27,6 +29,9 @@ const ProcessorFeatures& GetProcessorFeatures() {
 }
 
 InstructionSet ProcessorInstructionSet(const ProcessorFeatures& features) {
+    if (features.neon) {
+        return InstructionSet::Neon;
+    }
     if (!features.ssse3) {
         return InstructionSet::Sse2;
     }
@@ -47,7 +52,8 @@ InstructionSet Resolve(int32_t cpuLevel, const ProcessorFeatures& features) {
     if (cpuLevel < 3) {
         return InstructionSet::Scalar;
     }
-    return cpuLevel == 3 ? InstructionSet::Sse2 : ProcessorInstructionSet(features);
+    return cpuLevel == 3 && !features.neon ? InstructionSet::Sse2
+                                           : ProcessorInstructionSet(features);
 }
 
 InstructionSet Resolve(int32_t cpuLevel) {

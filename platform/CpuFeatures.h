@@ -5,9 +5,10 @@
 
 namespace kyv {
 
-// In rising order; each includes those before it. Avx512 means its foundation together with bytes
-// and words, doublewords and quadwords, and vector lengths (f, bw, dq, vl).
-enum class InstructionSet { Scalar, Sse2, Ssse3, Avx2, Avx512 };
+// In rising order; each of one architecture includes those before it. Avx512 means its foundation
+// together with bytes and words, doublewords and quadwords, and vector lengths (f, bw, dq, vl).
+// Neon is all that 64-bit ARM has here.
+enum class InstructionSet { Scalar, Sse2, Ssse3, Avx2, Avx512, Neon };
 
 // What a processor has and its operating system keeps across a change of threads. SSE2 is part of
 // x86-64.
@@ -18,6 +19,7 @@ struct ProcessorFeatures {
     bool avx512bw = false;
     bool avx512dq = false;
     bool avx512vl = false;
+    bool neon = false;
 };
 
 // Of this processor, read once.
@@ -27,8 +29,8 @@ const ProcessorFeatures& GetProcessorFeatures();
 InstructionSet ProcessorInstructionSet(const ProcessorFeatures& features);
 InstructionSet ProcessorInstructionSet();
 
-// The set for a host level on a processor: below 3 scalar, 3 SSE2, from 4 the best that it has. The
-// level is a ceiling, so one set too high cannot reach a missing instruction.
+// The set for a host level on a processor: below 3 scalar, 3 SSE2 (on ARM NEON), from 4 the best
+// that it has. The level is a ceiling, so one set too high cannot reach a missing instruction.
 InstructionSet Resolve(int32_t cpuLevel, const ProcessorFeatures& features);
 InstructionSet Resolve(int32_t cpuLevel);
 

@@ -29,6 +29,13 @@
 #define KYV_TABLE(name)                                                                            \
     .scalar = name##_scalar, .sse2 = sse2::name, .ssse3 = ssse3::name, .avx2 = avx2::name,         \
     .avx512 = avx512::name
+#elif defined(__aarch64__)
+#define KYV_FORMS(Row, name)                                                                       \
+    std::remove_pointer_t<Row> name##_scalar;                                                      \
+    namespace neon {                                                                               \
+    std::remove_pointer_t<Row> name;                                                               \
+    }
+#define KYV_TABLE(name) .scalar = name##_scalar, .neon = neon::name
 #endif
 
 namespace kyv {
@@ -49,6 +56,7 @@ struct KernelTable {
     Function ssse3 = nullptr;
     Function avx2 = nullptr;
     Function avx512 = nullptr;
+    Function neon = nullptr;
     // Sets whose form exists, is tested and timed, but serves no effect better than the next lower
     // one: SetBit of each. Twice the width of AVX2 gains nothing on pixels that come from memory,
     // so a table for which it does gain, in a whole effect, says so with kNoneIsPassedOver.
@@ -67,6 +75,8 @@ struct KernelTable {
             return avx2;
         case InstructionSet::Avx512:
             return avx512;
+        case InstructionSet::Neon:
+            return neon;
         }
         return nullptr;
     }

@@ -29,23 +29,20 @@
 //            high word of every 32 bits) Ascending32 (0, 1, 2 ...)
 // Bits       And Or Xor ClearBits(v, bits) Select(mask, yes, no)
 // Compare    Equal8 .. Equal32 GreaterS16 GreaterS32 give masks, all ones or zeros in a lane;
-// AllSet
-//            and AnySet of a mask
+//            AllSet and AnySet of a mask
 // Arithmetic Add8 .. Add32 Sub8 .. Sub32 AddSatU8 SubSatU8 SubSatU16 AverageU8 AverageU16 (rounded
 //            up) MinU8 MaxU8 MinS16 MaxS16 MulLow16 MulLow32 MulHighU16 MulHighS16 MulHighU32
-//            MulAddPairs16: a0 * b0 + a1 * b1 of signed words in 32 bits; MulRound15: (a * b +
-//            2^14)
-//            >> 15 for a within -2^14 .. 2^14 - 1
+//            MulEvenU32: the even numbers' products in 64 bits; MulAddPairs16: a0 * b0 + a1 * b1
+//            of signed words in 32 bits; MulRound20: ((a >> 5) * b + 2^14) >> 15 of signed words
 // Shifts     ShiftLeft16<n> ShiftRight16<n> ShiftRightS16<n>, the same with 32, ShiftLeft64
 //            ShiftRight64; ShiftRightBy32(v, n) by a number known only when it runs
 // Lanes      InterleaveLow8 .. 64, InterleaveHigh8 .. 64 of each block's first or last half;
-// PackU16
-//            (words to bytes, saturated) PackS16 (to signed bytes) PackS32 (to words); InOrder32
-//            and InOrder64 undo what two packings, or one, do to the order of blocks. WidenLow8
-//            WidenHigh8: a block's bytes as words. ExtendLowS16 ExtendHighS16: the vector's first
-//            or last half as 32 bits. MixWords(even, odd) TwiceLow16 DoubleLow32 DoubleHigh32
-//            DoubleEach64 (of half a vector) InterleaveHalves16 AlphaWords BlocksInOrder
-//            AddNeighbours32 SpreadHighWords SecondBytes
+//            PackU16 (words to bytes, saturated) PackS16 (to signed bytes) PackS32 (to words);
+//            InOrder32 and InOrder64 undo what two packings, or one, do to the order of blocks.
+//            WidenLow8 WidenHigh8: a block's bytes as words. ExtendLowS16 ExtendHighS16: the
+//            vector's first or last half as 32 bits. MixWords(even, odd) TwiceLow16 DoubleLow32
+//            DoubleHigh32 DoubleEach64 (of half a vector) InterleaveHalves16 AlphaWords
+//            BlocksInOrder AddNeighbours32 SpreadHighWords SecondBytes
 // Floats     SplatF32 AddF32 SubF32 MulF32 DivF32 MinF32 MaxF32 SqrtF32 F32FromS32 TruncateF32
 //            AsFloats (the bits); MinF32 and MaxF32 give the last operand where one is not a number
 // Doubles    SplatF64 AddF64 SubF64 MulF64 DivF64 MinF64 MaxF64 SqrtF64 NegateF64, kLongs of them;
@@ -68,11 +65,17 @@
 #define KYV_VECTOR_SET avx2
 #elif defined(KYV_VECTOR_SET_AVX512)
 #define KYV_VECTOR_SET avx512
+#elif defined(KYV_VECTOR_SET_NEON)
+#define KYV_VECTOR_SET neon
 #else
 #error "A vector file is compiled for one of the instruction sets that the build names."
 #endif
 
+#ifdef KYV_VECTOR_SET_NEON
+#include "imageutility/kernels/VectorNeon.h"
+#else
 #include "imageutility/kernels/VectorX86.h"
+#endif
 
 // What is made of those operations alone, whatever the architecture.
 namespace kyv::KYV_VECTOR_SET {

@@ -137,7 +137,7 @@ TEST(BoxBlur, DividesExactly) {
     std::mt19937 random(1);
     for (const auto set :
          {kyv::InstructionSet::Scalar, kyv::InstructionSet::Sse2, kyv::InstructionSet::Ssse3,
-          kyv::InstructionSet::Avx2, kyv::InstructionSet::Avx512}) {
+          kyv::InstructionSet::Avx2, kyv::InstructionSet::Avx512, kyv::InstructionSet::Neon}) {
         for (int32_t i = 1; i <= 127; ++i) {
             ExpectExactDivision<uint16_t>(kyv::kBoxBlur16, set, i, 128 - i);
             ExpectExactDivision<uint32_t>(kyv::kBoxBlur32, set, 127, i);

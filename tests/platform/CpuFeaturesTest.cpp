@@ -22,6 +22,7 @@ constexpr ProcessorFeatures kNew = {.ssse3 = true,
                                     .avx512bw = true,
                                     .avx512dq = true,
                                     .avx512vl = true};
+constexpr ProcessorFeatures kArm = {.neon = true};
 
 TEST(CpuFeatures, LevelIsACeilingAndTheProcessorDecidesWithinIt) {
     for (const ProcessorFeatures& processor : {kBare, kOld, kUsual, kNew}) {
@@ -36,6 +37,18 @@ TEST(CpuFeatures, LevelIsACeilingAndTheProcessorDecidesWithinIt) {
         EXPECT_EQ(Resolve(level, kUsual), InstructionSet::Avx2) << level;
         EXPECT_EQ(Resolve(level, kNew), InstructionSet::Avx512) << level;
     }
+}
+
+TEST(CpuFeatures, ArmHasOneSetForEveryLevelThatAsksForVectors) {
+    for (const int32_t level : {INT_MIN, 0, 2}) {
+        EXPECT_EQ(Resolve(level, kArm), InstructionSet::Scalar) << level;
+    }
+    for (const int32_t level : {3, 4, 5, INT_MAX}) {
+        EXPECT_EQ(Resolve(level, kArm), InstructionSet::Neon) << level;
+    }
+#ifdef __aarch64__
+    EXPECT_EQ(Resolve(3), InstructionSet::Neon); // this processor's
+#endif
 }
 
 TEST(CpuFeatures, SetIsUsedOnlyWhenAllOfItIsThere) {

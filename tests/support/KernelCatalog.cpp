@@ -108,6 +108,8 @@ const std::vector<KernelEntry>& KernelCatalog() {
 
 const char* NameOf(InstructionSet set) {
     switch (set) {
+    case InstructionSet::Neon:
+        return "neon";
     case InstructionSet::Avx512:
         return "avx512";
     case InstructionSet::Avx2:

@@ -61,8 +61,8 @@ struct KernelEntry {
 const std::vector<KernelEntry>& KernelCatalog();
 
 inline constexpr kyv::InstructionSet kInstructionSets[] = {
-    kyv::InstructionSet::Scalar, kyv::InstructionSet::Sse2, kyv::InstructionSet::Ssse3,
-    kyv::InstructionSet::Avx2, kyv::InstructionSet::Avx512};
+    kyv::InstructionSet::Scalar, kyv::InstructionSet::Sse2,   kyv::InstructionSet::Ssse3,
+    kyv::InstructionSet::Avx2,   kyv::InstructionSet::Avx512, kyv::InstructionSet::Neon};
 
 const char* NameOf(kyv::InstructionSet set);
 

@@ -11,6 +11,8 @@ SetProbeResult SetProbe() {
     constexpr InstructionSet kSet = InstructionSet::Avx2;
 #elif defined(__SSSE3__)
     constexpr InstructionSet kSet = InstructionSet::Ssse3;
+#elif defined(__ARM_NEON)
+    constexpr InstructionSet kSet = InstructionSet::Neon;
 #else
     constexpr InstructionSet kSet = InstructionSet::Sse2;
 #endif
