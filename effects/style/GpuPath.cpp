@@ -13,13 +13,15 @@ void* Lookup(const EffectContext& context, const char* name) {
     return context.gpuLibrary ? FindSymbol(context.gpuLibrary, name) : nullptr;
 }
 
-bool GetWrapper(const EffectContext& context, const char* name, void*& wrapper) {
+// Without the entry an object that has not been handed back stays in use.
+void GetWrapper(const EffectContext& context, const char* name, void*& wrapper, uint32_t& obtained,
+                Obtained bit) {
     const auto get = reinterpret_cast<GpuGetWrapperFunction>(Lookup(context, name));
     if (!get) {
-        return false;
+        return;
     }
     wrapper = get(0);
-    return wrapper != nullptr;
+    obtained = wrapper ? obtained | bit : obtained & ~uint32_t{bit};
 }
 
 void ReleaseWrapper(const EffectContext& context, const char* name, void* wrapper) {
@@ -42,13 +44,8 @@ GpuRenderFunction RenderOf(void* object) {
 
 void BindGpu(const EffectContext& context, GpuBinding& binding) {
     binding.device = context.gpuDevice;
-    binding.obtained = 0;
-    if (GetWrapper(context, KYV_GET_CUDART_NAME, binding.cudart)) {
-        binding.obtained |= kCudart;
-    }
-    if (GetWrapper(context, KYV_GET_BROOK_NAME, binding.brook)) {
-        binding.obtained |= kBrook;
-    }
+    GetWrapper(context, KYV_GET_CUDART_NAME, binding.cudart, binding.obtained, kCudart);
+    GetWrapper(context, KYV_GET_BROOK_NAME, binding.brook, binding.obtained, kBrook);
 }
 
 void HandBackGpu(const EffectContext& context, GpuBinding& binding) {

@@ -15,12 +15,13 @@ struct GpuBinding {
     void* cudart;      // the wrapper, or null; kept after it was handed back
     void* brook;       // likewise
     void* device;      // the host's device object when the instance was prepared
-    uint32_t obtained; // which wrappers the last preparation got and no release gave back
+    uint32_t obtained; // which wrappers a preparation got and no release gave back
     uint32_t reserved;
 };
 static_assert(sizeof(GpuBinding) == 32);
 
-// At BeginProcessing. An entry that the library lacks leaves its pointer as it was.
+// At BeginProcessing. An entry that the library lacks leaves its pointer as it was, and what it
+// leads to in use unless it was handed back.
 void BindGpu(const EffectContext& context, GpuBinding& binding);
 
 // At EndProcessing and DestroyInstance: hands every wrapper back whose pointer is not null, and

@@ -212,6 +212,30 @@ TEST_P(GpuPath, ModesWithoutAnObjectRenderOnTheProcessor) {
     }
 }
 
+TEST_P(GpuPath, WrapperStaysInUseWhenTheNextLibraryLacksTheEntry) {
+    const Helper cudartOnly(KYV_GPU_HELPER_CUDART_FILE);
+    ASSERT_NE(cudartOnly.log, nullptr);
+    CTestInstance instance(Effect(GetParam()), kWidth, kHeight);
+    for (void* library : {m_helper.library, cudartOnly.library, kyv::LibraryHandle{}}) {
+        instance.Context().gpuLibrary = library;
+        ASSERT_EQ(instance.Begin(), KYV_OK);
+        *m_helper.log = {};
+        instance.Context().gpuMode = GpuMode_BrookA;
+        Frame output(m_input.size());
+        ASSERT_EQ(instance.Render(output.data(), m_input.data()), KYV_OK);
+        EXPECT_EQ(m_helper.log->brook.count, 1U);
+        EXPECT_EQ(output, Flipped(m_input));
+    }
+    // A library whose entry has nothing to give takes the object out of use.
+    instance.Context().gpuLibrary = m_helper.library;
+    m_helper.log->withholdCudart = 1;
+    instance.Context().gpuMode = GpuMode_CudartA;
+    ASSERT_EQ(instance.Begin(), KYV_OK);
+    Frame output(m_input.size());
+    ASSERT_EQ(instance.Render(output.data(), m_input.data()), KYV_OK);
+    EXPECT_EQ(output, OnProcessor(m_input));
+}
+
 TEST_P(GpuPath, HelperIsToldTheGeometry) {
     const Frame input = RandomFrame(size_t{2} * kWidth * kHeight, 8);
     Frame output(input.size(), 3);
