@@ -17,6 +17,15 @@ void FillIdentity(uint32_t (&table)[256]) {
     }
 }
 
+bool IsIdentity(const uint32_t (&table)[256]) {
+    for (uint32_t i = 0; i < 256; ++i) {
+        if (table[i] != i) {
+            return false;
+        }
+    }
+    return true;
+}
+
 // The rounded luma of the reference, 0..255, in single precision and in this order.
 uint32_t ReferenceLuma(uint32_t r, uint32_t g, uint32_t b) {
     const float sum = (static_cast<float>(r) * 0.3F + 0.5F) + static_cast<float>(g) * 0.59F +
@@ -67,7 +76,7 @@ KyvStatus WhiteBalance::Process(EffectContext& context, Instance& instance) {
     const bool compare = params.Int(Comparison) != 0;
 
     // Single fields are left as they are: an ARGB frame is not touched at all, an AYUV frame
-    // carries the source after its round trip.
+    // carries the source, after its round trip when the tables would change a whole frame.
     const bool wholeFrame = context.fieldSelector != FieldSelector_First &&
                             context.fieldSelector != FieldSelector_Second;
     if (wholeFrame && reference != instance.reference) {
@@ -81,6 +90,12 @@ KyvStatus WhiteBalance::Process(EffectContext& context, Instance& instance) {
         BuildTable(instance.blue, b, luma);
     }
 
+    // The way through RGB and back would change an AYUV frame that is to stay as it is.
+    if (context.pixelFormat == PixelFormat_Ayuv && IsIdentity(instance.red) &&
+        IsIdentity(instance.green) && IsIdentity(instance.blue)) {
+        CopyView(geometry, instance.output, instance.input);
+        return KYV_OK;
+    }
     const CColorFrame frame(context, geometry, instance.output, instance.input);
     const KneeCurves curves({instance.blue, instance.reference >> 16 & 255},
                             {instance.green, instance.reference >> 8 & 255},

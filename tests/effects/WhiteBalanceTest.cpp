@@ -59,6 +59,32 @@ TEST(WhiteBalance, WhiteAndBlackReferencesChangeNothing) {
     EXPECT_THAT(Render({0xFF00000A, 0xFF000000}, 0x0A0000), ElementsAre(0xFF010101, 0xFF010100));
 }
 
+TEST(WhiteBalance, WhiteAndBlackReferencesChangeNoAyuvFrameEither) {
+    const Frame input = RandomFrame(2 * 5 * 3, 4);
+    for (const uint32_t reference : {0xFFFFFFU, 0x000000U}) {
+        for (const uint32_t layout : {0U, 1U, 2U}) {
+            for (const uint32_t field : {0U, 1U, 2U}) {
+                CTestInstance instance(Balance(), 5, 3);
+                instance.Context().pixelFormat = PixelFormat_Ayuv;
+                instance.Context().stereoLayout = layout;
+                instance.Context().fieldSelector = field;
+                ASSERT_EQ(instance.Begin(), KYV_OK);
+                instance.Set("P1", reference);
+                instance.Set("P2", 1);
+                const size_t stride = layout ? 10 : 5;
+                Frame output(stride * 3, 5);
+                Frame expected = output;
+                for (size_t y = 0; y < 3; ++y) {
+                    const size_t at = y * stride + (layout == 2 ? 5 : 0);
+                    std::copy_n(&input[at], 5, &expected[at]);
+                }
+                ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
+                EXPECT_EQ(output, expected) << reference << ' ' << layout << ' ' << field;
+            }
+        }
+    }
+}
+
 TEST(WhiteBalance, LevelsAgreeAndTheLeftHalfIsSpared) {
     for (const size_t width : {1U, 2U, 31U, 32U, 33U, 64U, 129U}) {
         const Frame input = RandomFrame(width, static_cast<uint32_t>(width));
@@ -125,6 +151,11 @@ TEST(WhiteBalance, AyuvFramesTakeTheRoundTripInEveryLayout) {
             instance.Context().fieldSelector = field;
             ASSERT_EQ(instance.Begin(), KYV_OK);
             instance.Set("P1", 0x2080FFU);
+            // A single field does not build the tables.
+            Frame before(input.size());
+            instance.Context().fieldSelector = 0;
+            ASSERT_EQ(instance.Render(before.data(), input.data()), KYV_OK);
+            instance.Context().fieldSelector = field;
             ASSERT_EQ(instance.Render(output.data(), input.data()), KYV_OK);
             EXPECT_EQ(output, expected) << "layout " << layout << " field " << field;
         }
