@@ -7,7 +7,7 @@ NativeString LanguageLibraryPath(const NativeString& modulePath, const NativeStr
     const NativeString path = modulePath.substr(0, modulePath.find('.')) +
                               std::filesystem::path("_").native() + language +
                               std::filesystem::path(".DLL").native();
-    return path.size() < kMaxPathUnits ? path : NativeString();
+    return CountPathUnits(path) < kMaxPathUnits ? path : NativeString();
 }
 
 NativeString FallbackLibraryPath(const NativeString& modulePath) {

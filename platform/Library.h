@@ -18,8 +18,13 @@ inline constexpr size_t kMaxPathUnits = 260;
 // The library, or the program, that this code is linked into. The reference stays its loader's.
 LibraryHandle OwnLibrary();
 
+// How many units of a path count towards that: UTF-16 units on Windows; on Linux characters of
+// UTF-8, and every byte that belongs to none.
+size_t CountPathUnits(const NativeString& path);
+
 // The full path, without "." or ".." parts, of a loaded library; at most kMaxPathUnits - 1 units,
-// cut off beyond. Empty when the handle is unknown.
+// cut off beyond. Empty when the handle is unknown. A relative path that this library was loaded
+// by holds for the working folder of that time.
 NativeString LibraryFileName(LibraryHandle library);
 
 // The file of the library or the program that holds an address of code, as the system tells it.

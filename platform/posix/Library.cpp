@@ -2,6 +2,7 @@
 #include "platform/Library.h"
 
 #include <array>
+#include <cstdint>
 #include <cstdlib>
 #include <string_view>
 
@@ -72,18 +73,58 @@ LibraryHandle OwnLibrary() {
     return self;
 }
 
-NativeString LibraryFileName(LibraryHandle library) {
+namespace {
+
+// The byte after the first units of a path.
+size_t EndOfUnits(const NativeString& path, size_t units) {
+    size_t end = 0;
+    for (; units > 0 && end < path.size(); --units) {
+        const auto lead = static_cast<uint8_t>(path[end++]);
+        for (int rest = lead >= 0xF0   ? 3
+                        : lead >= 0xE0 ? 2
+                        : lead >= 0xC0 ? 1
+                                       : 0;
+             rest > 0 && end < path.size() && (static_cast<uint8_t>(path[end]) & 0xC0) == 0x80;
+             --rest) {
+            ++end;
+        }
+    }
+    return end;
+}
+
+NativeString AbsoluteName(LibraryHandle library) {
     const link_map* map = nullptr;
     if (!library || dlinfo(library, RTLD_DI_LINKMAP, &map) != 0 || !map->l_name) {
         return {};
     }
-    // The name is as the loader was given it. One that is relative holds for the working folder
-    // at that time, which is as good as ours unless the host has moved meanwhile.
     std::error_code error;
-    NativeString path = std::filesystem::absolute(map->l_name, error).lexically_normal().native();
-    if (path.size() >= kMaxPathUnits) {
-        path.resize(kMaxPathUnits - 1);
+    return std::filesystem::absolute(map->l_name, error).lexically_normal().native();
+}
+
+// The loader keeps a name as it was given, and the host may leave the folder that it holds for.
+// This is made while the library is being loaded.
+const NativeString g_ownName = []() noexcept -> NativeString {
+    try {
+        return AbsoluteName(OwnLibrary());
+    } catch (...) {
+        return {}; // no memory; asked for again when it is needed
     }
+}();
+
+} // namespace
+
+size_t CountPathUnits(const NativeString& path) {
+    size_t units = 0;
+    for (size_t end = 0; end < path.size(); ++units) {
+        end += EndOfUnits(path.substr(end, 4), 1);
+    }
+    return units;
+}
+
+NativeString LibraryFileName(LibraryHandle library) {
+    NativeString path =
+        library == OwnLibrary() && !g_ownName.empty() ? g_ownName : AbsoluteName(library);
+    path.resize(EndOfUnits(path, kMaxPathUnits - 1));
     return path;
 }
 

@@ -13,6 +13,10 @@ LibraryHandle OwnLibrary() {
     return &__ImageBase;
 }
 
+size_t CountPathUnits(const NativeString& path) {
+    return path.size();
+}
+
 NativeString LibraryFileName(LibraryHandle library) {
     wchar_t path[kMaxPathUnits];
     const DWORD length =

@@ -33,6 +33,13 @@ TEST(LanguageLibraryPath, IsCutAtTheFirstDotOfTheWholePath) {
     // 260 units with the terminating zero are the limit; 251 + "_ENU.DLL" just fits.
     EXPECT_EQ(path(std::string(251, 'x').c_str()).size(), 259U);
     EXPECT_EQ(path(std::string(252, 'x').c_str()), "");
+    // Characters count, however many bytes one has.
+    const auto fits = [](size_t count) {
+        const fs::path module(std::u16string(count, u'\u00E9'));
+        return !LanguageLibraryPath(module.native(), FromAscii("ENU").native()).empty();
+    };
+    EXPECT_TRUE(fits(251));
+    EXPECT_FALSE(fits(252));
 }
 
 TEST(LanguageLibraryPath, FallbackIsNotNamedRes) {
@@ -127,6 +134,23 @@ TEST_F(LanguageLibrary, BesideTheModuleIsFoundAndReleased) {
 TEST_F(LanguageLibrary, DotInAFolderNameMovesTheSearch) {
     AddLanguage("a"); // for a.b/plug.bin
     Load(fs::path("a.b") / "plug.bin");
+    ModuleDescriptor* module = nullptr;
+    ASSERT_EQ(m_init(&module), 0U);
+    EXPECT_NE(module->ResourceLibrary, m_library);
+    EXPECT_EQ(m_deInit(), 0U);
+}
+
+TEST_F(LanguageLibrary, IsFoundWhenTheHostHasLeftTheFolderItLoadedFrom) {
+    AddLanguage("plug");
+    const fs::path before = fs::current_path();
+    fs::current_path(m_root);
+    fs::copy_file(kyvtest::ModuleFile(), "plug.bin");
+    m_library = OpenLibrary((fs::path(".") / "plug.bin").native());
+    fs::current_path(before);
+    ASSERT_NE(m_library, nullptr);
+    m_init = reinterpret_cast<KyvInitModuleFunction>(FindSymbol(m_library, KYV_INIT_MODULE_NAME));
+    m_deInit =
+        reinterpret_cast<KyvDeInitModuleFunction>(FindSymbol(m_library, KYV_DEINIT_MODULE_NAME));
     ModuleDescriptor* module = nullptr;
     ASSERT_EQ(m_init(&module), 0U);
     EXPECT_NE(module->ResourceLibrary, m_library);
