@@ -10,13 +10,15 @@
 //     static void Release(EffectContext&, Instance&);        // may be called again and again
 //
 // Begin may also return a KyvStatus. None of them sees a null context or null instance data, and
-// what they throw is turned into a status here: nothing crosses the host boundary.
+// what they throw is turned into a status here: nothing crosses the host boundary. They compute in
+// the default floating-point environment, and the host finds its own as it was.
 #pragma once
 
 #include <cstring>
 #include <type_traits>
 
 #include "interface/HostInterface.h"
+#include "platform/FloatEnvironment.h"
 
 namespace kyv {
 
@@ -35,6 +37,13 @@ KyvStatus Guard(Body&& body) noexcept {
     } catch (...) {
         return KYV_FAIL;
     }
+}
+
+// Runs a body of an effect's own, which computes as it always does, whatever the host's settings.
+template <class Body>
+KyvStatus GuardEffect(Body&& body) noexcept {
+    const CFloatEnvironment environment;
+    return Guard(body);
 }
 
 // The same for every effect: notify the host, then write the defaults, packed in table order.
@@ -60,7 +69,7 @@ struct EffectGlue {
         if (!context->instanceData) {
             return KYV_OK;
         }
-        return glue::Guard([&] { return Effect::Release(*context, *Data(*context)); });
+        return glue::GuardEffect([&] { return Effect::Release(*context, *Data(*context)); });
     }
 
     static KyvStatus SetInputFrame(uint32_t index, EffectContext* context) noexcept {
@@ -78,14 +87,14 @@ struct EffectGlue {
         if (!context || !context->instanceData) {
             return KYV_FAIL;
         }
-        return glue::Guard([&] { return Effect::Process(*context, *Data(*context)); });
+        return glue::GuardEffect([&] { return Effect::Process(*context, *Data(*context)); });
     }
 
     static KyvStatus BeginProcessing(EffectContext* context) noexcept {
         if (!context || !context->instanceData) {
             return KYV_FAIL;
         }
-        return glue::Guard([&] { return Effect::Begin(*context, *Data(*context)); });
+        return glue::GuardEffect([&] { return Effect::Begin(*context, *Data(*context)); });
     }
 
     // EndProcessing and DestroyInstance are one routine.

@@ -20,7 +20,8 @@
 //
 // Threads: the two exports may be called from any thread. The callbacks take no lock. Two callbacks
 // of one instance must not run at the same time; different instances may run on different threads.
-// Callbacks never throw.
+// Callbacks never throw. They compute in the default floating-point environment, whatever the
+// host's is, and leave the host's as it was.
 //
 // Frames: 32 bits a pixel, rows top down and contiguous, no padding. In memory a pixel is B, G, R,
 // A (ARGB frames, straight alpha, full range) or V, U, Y, A (AYUV frames, BT.601 studio range: Y

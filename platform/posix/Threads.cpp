@@ -17,6 +17,8 @@
 #include <ucontext.h>
 #include <unistd.h>
 
+#include "platform/FloatEnvironment.h"
+
 namespace kyv {
 namespace {
 
@@ -234,6 +236,7 @@ struct CThread::State {
     static void* Main(void* argument) {
         auto* self = static_cast<State*>(argument);
         MaskSignals();
+        const CFloatEnvironment environment; // not the one that it was started in
         if (sigsetjmp(self->leave, 1) == 0) {
             self->inside = true;
             self->entry(self->argument);

@@ -6,6 +6,8 @@
 
 #include <windows.h>
 
+#include "platform/FloatEnvironment.h"
+
 // The start of this module's image in memory. The linker chose the name.
 extern "C" IMAGE_DOS_HEADER __ImageBase; // NOLINT(bugprone-reserved-identifier)
 
@@ -63,6 +65,7 @@ struct CThread::State {
 
     static DWORD WINAPI Main(LPVOID state) {
         const auto* self = static_cast<const State*>(state);
+        const CFloatEnvironment environment;
         return self->entry(self->argument);
     }
 
