@@ -16,9 +16,6 @@ void BlurInPlace(const CImageBase& image, int32_t radius) {
     }
     const size_t rowBytes = static_cast<size_t>(image.GetWidth()) * 4;
     const kyv::CPageBlock block(rowBytes * static_cast<size_t>(image.GetHeight()));
-    if (!block.GetData()) {
-        return;
-    }
     CImageARGB copy(block.GetData(), image.GetWidth(), image.GetHeight(),
                     static_cast<int32_t>(rowBytes));
     copy.TakeCpuLevel(image);

@@ -166,7 +166,7 @@ public:
 
     // Scales the whole image into the whole destination, whose memory must be another. Both must
     // be at least 2 x 2. Alpha is scaled like a colour. The mode is a ResizeMode; any other number
-    // does nothing.
+    // does nothing. Throws std::bad_alloc, with nothing written.
     void Resize(CImageARGB& destination, int32_t mode) const;
     // The same; false when nothing was written, for callers that go on with the result.
     bool TryResize(CImageARGB& destination, int32_t mode) const;
@@ -233,7 +233,7 @@ public:
     // is inside the image: sum / pixels inside, truncated. A radius that is not less than half the
     // shorter side is reduced to (shorter side - 1) / 2; 0 copies and a negative one does nothing.
     // The destination, of the same size, may be this image itself but not overlap it otherwise.
-    // The cost does not depend on the radius. Without memory for the scratch nothing is written.
+    // The cost does not depend on the radius. Throws std::bad_alloc, with nothing written.
     void BoxBlur(CImageARGB& destination, int32_t radius) const;
 
     // 128 plus the luma of the neighbour in a direction less that of the opposite one, clamped.

@@ -63,13 +63,10 @@ private:
     int32_t m_nRow[2] = {-1, -1};
 };
 
-bool ResizeBilinear(const CImageARGB& source, const CImageARGB& destination) {
+void ResizeBilinear(const CImageARGB& source, const CImageARGB& destination) {
     const int32_t width = destination.GetWidth();
     const int32_t height = destination.GetHeight();
     const kyv::CPageBlock block(BilinearScratch(nullptr, width, height).layout.GetBytes());
-    if (!block.GetData()) {
-        return false;
-    }
     const BilinearScratch scratch(block.GetData(), width, height);
     BuildResizeSteps(scratch.columnSteps, source.GetWidth(), width);
     BuildResizeSteps(scratch.rowSteps, source.GetHeight(), height);
@@ -91,7 +88,6 @@ bool ResizeBilinear(const CImageARGB& source, const CImageARGB& destination) {
         const uint8_t* second = step.fraction == 0 ? first : rows.Get(upper + 1);
         lerp(destination.Row(y), first, second, count, step.fraction);
     }
-    return true;
 }
 
 // --- Row pick
@@ -104,9 +100,6 @@ bool ResizeRowPick(const CImageARGB& source, const CImageARGB& destination) {
     kyv::CScratchLayout size;
     size.Take<uint32_t>(static_cast<size_t>(height) + 1);
     const kyv::CPageBlock block(size.GetBytes());
-    if (!block.GetData()) {
-        return false;
-    }
     auto* steps = reinterpret_cast<uint32_t*>(block.GetData());
     BuildResizeSteps(steps, source.GetHeight(), height);
     const size_t rowBytes = static_cast<size_t>(destination.GetWidth()) * 4;
@@ -169,12 +162,9 @@ void CubicRow(int32_t* dst, const uint8_t* src, int32_t width, int32_t sourceWid
     }
 }
 
-bool ResizeCubic(const CImageARGB& source, const CImageARGB& destination) {
+void ResizeCubic(const CImageARGB& source, const CImageARGB& destination) {
     const int32_t width = destination.GetWidth();
     const kyv::CPageBlock block(CubicScratch(nullptr, width).layout.GetBytes());
-    if (!block.GetData()) {
-        return false;
-    }
     const CubicScratch scratch(block.GetData(), width);
     const int64_t ratio = CubicRatio(source.GetHeight(), destination.GetHeight());
     int32_t cached[4] = {-1, -1, -1, -1};
@@ -201,7 +191,6 @@ bool ResizeCubic(const CImageARGB& source, const CImageARGB& destination) {
             out[i] = kyv::ClampByte((sum + kHalf) >> (2 * kCubicShift));
         }
     }
-    return true;
 }
 
 bool HasTwoByTwo(const CImageARGB& image) {
@@ -216,11 +205,13 @@ bool CImageARGB::TryResize(CImageARGB& destination, int32_t mode) const {
     }
     switch (mode) {
     case ResizeMode_Bilinear:
-        return ResizeBilinear(*this, destination);
+        ResizeBilinear(*this, destination);
+        return true;
     case ResizeMode_RowPick:
         return ResizeRowPick(*this, destination);
     case ResizeMode_Cubic:
-        return ResizeCubic(*this, destination);
+        ResizeCubic(*this, destination);
+        return true;
     default:
         return false;
     }

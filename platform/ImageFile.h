@@ -38,6 +38,9 @@ enum class ImageFormat { Bmp, Jpeg, Png, Tiff };
 // The decoding functions return true when the picture in the target counts; after false whatever
 // the target received is to be thrown away.
 
+// True when a module has something under a type name (case is ignored) and an id.
+bool HasResource(LibraryHandle module, const char* type, uint16_t id);
+
 // A picture in any of the formats, stored in a module under a type name (case is ignored) and an
 // id. On Linux only the library that this code is part of has resources.
 bool DecodeResource(LibraryHandle module, const char* type, uint16_t id, CPixelTarget& target);

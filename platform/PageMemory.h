@@ -12,7 +12,8 @@ public:
     // The working pointer is a multiple of this.
     static constexpr size_t kAlignment = 32;
 
-    // Takes bytes plus the slack for the alignment. 0 bytes, or a refusal, leave an empty block.
+    // Takes bytes plus the slack for the alignment; 0 bytes leave an empty block. Throws
+    // std::bad_alloc when the system refuses.
     explicit CPageBlock(size_t bytes);
     ~CPageBlock();
 

@@ -7,7 +7,6 @@
 
 #include "effects/particle/ParticleFrame.h"
 #include "effects/particle/ParticleFxBubble.h"
-#include "imageutility/Bitmap.h"
 
 namespace kyv {
 namespace {
@@ -39,11 +38,8 @@ void Begin(EffectContext& context, BubbleInstance& instance, uint16_t maskId) {
     auto body = std::make_unique<CImageARGB>();
     auto mask = std::make_unique<CImageARGB>();
     body->SetCpuLevel(context.cpuLevel);
-    if (context.descriptor && context.descriptor->module) {
-        const KyvModuleHandle module = context.descriptor->module->ModuleHandle;
-        LoadPngResource(*body, module, "PNG", kBodyId);
-        LoadPngResource(*mask, module, "PNG", maskId);
-    }
+    LoadPicture(*body, context, kBodyId);
+    LoadPicture(*mask, context, maskId);
     if (context.pixelFormat == PixelFormat_Ayuv && body->GetBuffer()) {
         CImageAYUV converted(body->GetBuffer(), body->GetWidth(), body->GetHeight(),
                              body->GetPitch());

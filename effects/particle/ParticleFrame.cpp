@@ -5,7 +5,9 @@
 #include <new>
 
 #include "effects/particle/ParticleMath.h"
+#include "imageutility/Bitmap.h"
 #include "interface/ParamReader.h"
+#include "platform/ImageFile.h"
 
 namespace kyv {
 namespace {
@@ -32,13 +34,18 @@ int32_t GetPositionMs(const EffectContext& context, const PreviewSpan& preview) 
     return preview.startMs + TruncateToInt(preview.lengthMs * inside);
 }
 
-void Scale(const CImageARGB& from, CImageARGB& to) {
-    if (!from.TryResize(to, ResizeMode_Bilinear)) {
+} // namespace
+
+void LoadPicture(CImageARGB& picture, const EffectContext& context, uint16_t id) {
+    if (!context.descriptor || !context.descriptor->module) {
+        return;
+    }
+    const KyvModuleHandle module = context.descriptor->module->ModuleHandle;
+    LoadPngResource(picture, module, "PNG", id);
+    if (!picture.GetBuffer() && HasResource(module, "PNG", id)) {
         throw std::bad_alloc();
     }
 }
-
-} // namespace
 
 bool ReadChanged(const EffectContext& context, uint32_t depth, std::span<float> cached) {
     bool changed = false;
@@ -109,13 +116,13 @@ void CParticleCanvas::Load() {
         m_ayuvView.ToARGB(m_frame);
     }
     if (m_bScaled) {
-        Scale(m_frame, m_canvas);
+        m_frame.Resize(m_canvas, ResizeMode_Bilinear);
     }
 }
 
 void CParticleCanvas::Store() {
     if (m_bScaled) {
-        Scale(m_canvas, m_frame);
+        m_canvas.Resize(m_frame, ResizeMode_Bilinear);
     }
     if (m_bConverted) {
         m_frame.ToAYUV(m_ayuvView);

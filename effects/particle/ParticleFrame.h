@@ -15,6 +15,10 @@
 
 namespace kyv {
 
+// Loads a picture that the module carries; one that it does not carry leaves the image empty.
+// Throws std::bad_alloc when there is one and it cannot be had.
+void LoadPicture(KYVImageUtility::CImageARGB& picture, const EffectContext& context, uint16_t id);
+
 inline constexpr uint32_t kNoDepth = UINT32_MAX; // of an effect without a depth
 
 // The parameters as simulations may have them: -1..1 for the depth, 0..1 for the others, which are

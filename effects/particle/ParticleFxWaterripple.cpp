@@ -27,10 +27,12 @@ void CParticleFxWaterripple::SetFrame(const FrameSetup& setup) {
         m_nHeight = setup.canvas->GetHeight();
     }
     if (!m_sheen.GetBuffer()) {
-        m_sheen.Create(m_nWidth, m_nHeight);
-        if (!setup.sheen->TryResize(m_sheen, KYVImageUtility::ResizeMode_Bilinear)) {
-            m_sheen.FillBytes(0);
+        KYVImageUtility::CImageARGB sheen; // kept once it is whole
+        sheen.Create(m_nWidth, m_nHeight);
+        if (!setup.sheen->TryResize(sheen, KYVImageUtility::ResizeMode_Bilinear)) {
+            sheen.FillBytes(0); // too small to be scaled
         }
+        m_sheen.Swap(sheen);
     }
     m_fScale = setup.scale;
 }

@@ -5,7 +5,6 @@
 
 #include "effects/particle/ParticleFrame.h"
 #include "effects/particle/ParticleFxWaterripple.h"
-#include "imageutility/Bitmap.h"
 
 namespace kyv {
 namespace {
@@ -23,9 +22,7 @@ void WaterRipple::Begin(EffectContext& context, Instance& instance) {
     instance.params[Density] = 0.0F;
     auto particles = std::make_unique<CParticleFxWaterripple>();
     auto sheen = std::make_unique<CImageARGB>();
-    if (context.descriptor && context.descriptor->module) {
-        LoadPngResource(*sheen, context.descriptor->module->ModuleHandle, "PNG", kSheenId);
-    }
+    LoadPicture(*sheen, context, kSheenId);
     instance.particles = particles.release();
     instance.sheen = sheen.release();
 }

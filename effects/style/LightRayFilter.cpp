@@ -137,13 +137,15 @@ void CLightRayFilter::Prepare(const StyleFrame& frame, float x, float y, uint32_
     const float lightX = x * static_cast<float>(width) - 0.5F;
     const float lightY = y * static_cast<float>(height) - 0.5F;
     if (lightX != m_lightX || lightY != m_lightY || width != m_shadowWidth ||
-        height != m_shadowHeight || m_shadows.empty()) {
+        height != m_shadowHeight || !m_bShadowsFilled) {
+        m_bShadowsFilled = false; // should an allocation fail
         m_shadows.resize(pixels);
         m_shadowWidth = width;
         m_shadowHeight = height;
         m_lightX = lightX;
         m_lightY = lightY;
         InBands(height, [this](int32_t first, int32_t end, BandRows&) { FillShadows(first, end); });
+        m_bShadowsFilled = true;
     }
 }
 

@@ -56,7 +56,8 @@ private:
     std::vector<uint16_t> m_light; // 4 words a pixel of the small picture
     std::vector<uint16_t> m_next;
     std::vector<uint16_t> m_shadows; // one word a pixel, in 1/65536
-    int32_t m_shadowWidth = 0;       // for which they were made
+    bool m_bShadowsFilled = false;
+    int32_t m_shadowWidth = 0; // for which they were made
     int32_t m_shadowHeight = 0;
     float m_lightX = 0.0F; // in small pixels
     float m_lightY = 0.0F;

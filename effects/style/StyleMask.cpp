@@ -64,22 +64,23 @@ void CStyleMask::Update(const MaskShape& shape, int32_t width, int32_t height) {
         m_kind = whole != shape.outside ? Kind::Whole : Kind::Nothing;
         return;
     }
-    if (m_weights.GetBuffer() && m_shape == shape && m_width == width && m_height == height) {
-        m_kind = Kind::Shape;
+    m_kind = Kind::Shape;
+    if (m_bFilled && m_shape == shape && m_width == width && m_height == height) {
         return;
     }
+    m_bFilled = false; // should an allocation fail
     if (m_width != width || m_height != height || !m_weights.GetBuffer()) {
         m_weights.Create(width, height);
         m_width = width;
         m_height = height;
     }
     m_shape = shape;
-    m_kind = Kind::Shape;
     if (shape.ellipse) {
         FillEllipse();
     } else {
         FillBox();
     }
+    m_bFilled = true;
 }
 
 void CStyleMask::FillBox() {

@@ -50,6 +50,7 @@ private:
     void FillEllipse();
 
     Kind m_kind = Kind::Whole;
+    bool m_bFilled = false; // the weights are those of this shape
     MaskShape m_shape;
     int32_t m_width = 0;
     int32_t m_height = 0;

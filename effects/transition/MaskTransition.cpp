@@ -77,7 +77,7 @@ struct BlendJob {
 };
 
 void EnsureSize(CImageARGB& image, int32_t width, int32_t height) {
-    if (image.GetWidth() != width || image.GetHeight() != height) {
+    if (!image.GetBuffer() || image.GetWidth() != width || image.GetHeight() != height) {
         image.Create(width, height);
     }
 }
@@ -102,9 +102,10 @@ bool CMaskTransition::LoadMask(const EffectContext& context, uint16_t bitmapId) 
     // A frame of one column or row uses the first of two.
     CImageARGB fitted(std::max(display.width, kLeastScalable),
                       std::max(geometry.height, kLeastScalable));
-    if (!fitted.GetBuffer() || !bitmap.TryResize(fitted, ResizeMode_Bilinear)) {
+    if (!fitted.GetBuffer()) {
         throw std::bad_alloc();
     }
+    bitmap.Resize(fitted, ResizeMode_Bilinear);
     // A quarter of the memory to read for every frame.
     m_mask.Create(fitted.GetWidth(), fitted.GetHeight());
     fitted.GetChannel(m_mask, kRed);
@@ -131,10 +132,8 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
                           geometry.height >= kLeastScalable;
     for (int i = 0; isScaled && i < 2; ++i) {
         EnsureSize(m_scaled[i], display.width, geometry.height);
-        m_scaled[i].TakeCpuLevel(geometry.level);
-        if (!pictures[i].TryResize(m_scaled[i], ResizeMode_Bilinear)) {
-            throw std::bad_alloc();
-        }
+        m_scaled[i].SetCpuLevel(context.cpuLevel);
+        pictures[i].Resize(m_scaled[i], ResizeMode_Bilinear);
     }
     BlendJob job = {
         .output = isScaled ? m_scaled[0] : target,
@@ -150,8 +149,8 @@ void CMaskTransition::Render(const EffectContext& context, void* output, void* c
         return;
     }
     job.BlendRows(0, geometry.height);
-    if (isScaled && !m_scaled[0].TryResize(target, ResizeMode_Bilinear)) {
-        throw std::bad_alloc();
+    if (isScaled) {
+        m_scaled[0].Resize(target, ResizeMode_Bilinear);
     }
 }
 

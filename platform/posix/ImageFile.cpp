@@ -121,6 +121,10 @@ bool DecodeImage(ByteView file, CPixelTarget& target) {
     return Begins({'B', 'M'}) && DecodeBmp(file, target);
 }
 
+bool HasResource(LibraryHandle module, const char* type, uint16_t id) {
+    return FindResource(module, type, id).size > 0;
+}
+
 bool DecodeResource(LibraryHandle module, const char* type, uint16_t id, CPixelTarget& target) {
     try {
         return DecodeImage(FindResource(module, type, id), target);

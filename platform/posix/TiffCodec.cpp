@@ -4,6 +4,7 @@
 #include <limits>
 #include <memory>
 
+#include <fcntl.h>
 #include <tiffio.h>
 
 #include "platform/posix/ImageCodecs.h"
@@ -67,7 +68,11 @@ int Silence(TIFF*, void*, const char*, const char*, va_list) {
 }
 
 struct CloseTiff {
-    void operator()(TIFF* tiff) const { TIFFClose(tiff); }
+    // Closing would write what was begun and not flushed; where memory ran out that is not whole.
+    void operator()(TIFF* tiff) const {
+        TIFFSetMode(tiff, O_RDONLY);
+        TIFFClose(tiff);
+    }
 };
 using TiffPointer = std::unique_ptr<TIFF, CloseTiff>;
 
@@ -280,6 +285,41 @@ bool ReadReadyMade(TIFF* tiff, uint8_t* pixels, uint32_t width, uint32_t height)
     return whole != 0;
 }
 
+bool WritePicture(TIFF* out, const PixelRows& source) {
+    const uint16_t extra[] = {EXTRASAMPLE_UNASSALPHA};
+    if (!TIFFSetField(out, TIFFTAG_IMAGEWIDTH, source.width) ||
+        !TIFFSetField(out, TIFFTAG_IMAGELENGTH, source.height) ||
+        !TIFFSetField(out, TIFFTAG_SAMPLESPERPIXEL, 4) ||
+        !TIFFSetField(out, TIFFTAG_BITSPERSAMPLE, 8) ||
+        !TIFFSetField(out, TIFFTAG_EXTRASAMPLES, 1, extra) ||
+        !TIFFSetField(out, TIFFTAG_PHOTOMETRIC, PHOTOMETRIC_RGB) ||
+        !TIFFSetField(out, TIFFTAG_PLANARCONFIG, PLANARCONFIG_CONTIG) ||
+        !TIFFSetField(out, TIFFTAG_COMPRESSION, COMPRESSION_LZW) ||
+        !TIFFSetField(out, TIFFTAG_ROWSPERSTRIP, TIFFDefaultStripSize(out, 0))) {
+        return false; // some of them need memory
+    }
+    // This one does not say so when it finds none.
+    uint16_t extras = 0;
+    const uint16_t* kinds = nullptr;
+    if (TIFFGetField(out, TIFFTAG_EXTRASAMPLES, &extras, &kinds) != 1 || extras != 1 || !kinds) {
+        return false;
+    }
+    Bytes row(static_cast<size_t>(source.width) * 4);
+    for (int32_t y = 0; y < source.height; ++y) {
+        const uint8_t* from = source.pixels + ptrdiff_t{y} * source.pitch;
+        for (size_t i = 0; i < row.size(); i += 4) {
+            row[i] = from[i + 2];
+            row[i + 1] = from[i + 1];
+            row[i + 2] = from[i];
+            row[i + 3] = from[i + 3];
+        }
+        if (TIFFWriteScanline(out, row.data(), static_cast<uint32_t>(y)) != 1) {
+            return false;
+        }
+    }
+    return TIFFFlush(out) == 1;
+}
+
 } // namespace
 
 bool DecodeTiff(ByteView file, CPixelTarget& target) {
@@ -315,34 +355,8 @@ bool DecodeTiff(ByteView file, CPixelTarget& target) {
 
 bool EncodeTiff(const PixelRows& source, Bytes& file) {
     MemoryFile memory = {{}, &file, 0};
-    TiffPointer tiff = Open(memory, "w");
-    if (!tiff) {
-        return false;
-    }
-    const uint16_t extra[] = {EXTRASAMPLE_UNASSALPHA};
-    TIFFSetField(tiff.get(), TIFFTAG_IMAGEWIDTH, source.width);
-    TIFFSetField(tiff.get(), TIFFTAG_IMAGELENGTH, source.height);
-    TIFFSetField(tiff.get(), TIFFTAG_SAMPLESPERPIXEL, 4);
-    TIFFSetField(tiff.get(), TIFFTAG_BITSPERSAMPLE, 8);
-    TIFFSetField(tiff.get(), TIFFTAG_EXTRASAMPLES, 1, extra);
-    TIFFSetField(tiff.get(), TIFFTAG_PHOTOMETRIC, PHOTOMETRIC_RGB);
-    TIFFSetField(tiff.get(), TIFFTAG_PLANARCONFIG, PLANARCONFIG_CONTIG);
-    TIFFSetField(tiff.get(), TIFFTAG_COMPRESSION, COMPRESSION_LZW);
-    TIFFSetField(tiff.get(), TIFFTAG_ROWSPERSTRIP, TIFFDefaultStripSize(tiff.get(), 0));
-    Bytes row(static_cast<size_t>(source.width) * 4);
-    for (int32_t y = 0; y < source.height; ++y) {
-        const uint8_t* from = source.pixels + ptrdiff_t{y} * source.pitch;
-        for (size_t i = 0; i < row.size(); i += 4) {
-            row[i] = from[i + 2];
-            row[i + 1] = from[i + 1];
-            row[i + 2] = from[i];
-            row[i + 3] = from[i + 3];
-        }
-        if (TIFFWriteScanline(tiff.get(), row.data(), static_cast<uint32_t>(y)) != 1) {
-            return false;
-        }
-    }
-    return TIFFFlush(tiff.get()) == 1;
+    const TiffPointer tiff = Open(memory, "w");
+    return tiff && WritePicture(tiff.get(), source);
 }
 
 } // namespace kyv

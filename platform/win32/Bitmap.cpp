@@ -72,7 +72,9 @@ uint32_t GetBitmapBits32(BitmapHandle bitmap, RowOrder rowOrder, uint8_t** pixel
             info.header.biPlanes = 1;
             info.header.biBitCount = 32;
             info.header.biCompression = BI_RGB;
-            Query(static_cast<uint32_t>(height), *pixels);
+            if (Query(static_cast<uint32_t>(height), *pixels) == 0) {
+                bytes = 0;
+            }
         }
     }
     DeleteDC(display);

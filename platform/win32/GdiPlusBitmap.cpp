@@ -72,10 +72,13 @@ bool CGdiPlusBitmap::CopyTo(CPixelTarget& target) const {
     data.Stride = static_cast<INT>(width) * 4;
     data.PixelFormat = kFormat;
     data.Scan0 = pixels;
-    if (Gdip::GdipBitmapLockBits(m_pBitmap, &all,
-                                 Gdiplus::ImageLockModeRead | Gdiplus::ImageLockModeUserInputBuf,
-                                 kFormat, &data) == Gdiplus::Ok) {
+    const Gdiplus::Status locked = Gdip::GdipBitmapLockBits(
+        m_pBitmap, &all, Gdiplus::ImageLockModeRead | Gdiplus::ImageLockModeUserInputBuf, kFormat,
+        &data);
+    if (locked == Gdiplus::Ok) {
         Gdip::GdipBitmapUnlockBits(m_pBitmap, &data);
+    } else if (locked == Gdiplus::OutOfMemory) {
+        return false; // nothing is wrong with the picture
     } else {
         // The image keeps its new size, but not what the heap held before.
         std::memset(pixels, 0, size_t{width} * 4 * height);

@@ -80,6 +80,10 @@ bool DecodeWith(ExternalDecoder* decoder, const wchar_t* path, int32_t& decodeOp
 
 } // namespace
 
+bool HasResource(LibraryHandle module, const char* type, uint16_t id) {
+    return type && FindResourceA(static_cast<HMODULE>(module), MAKEINTRESOURCEA(id), type);
+}
+
 bool DecodeResource(LibraryHandle module, const char* type, uint16_t id, CPixelTarget& target) {
     const CGdiPlusSession session;
     if (!session.IsStarted() || !type) {

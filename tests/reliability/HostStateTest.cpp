@@ -60,7 +60,7 @@ INSTANTIATE_TEST_SUITE_P(AllEffects, HostStates, testing::ValuesIn(AllEffects())
                          [](const auto& entry) { return EffectName(*entry.param); });
 
 TEST_P(HostStates, DecideNoByteAndStay) {
-    for (uint32_t seed = 0; seed < KYV_SCENES; ++seed) {
+    for (const uint32_t seed : Seeds(8, 100)) {
         const Scene scene = RandomScene(*GetParam(), seed);
         const Frame inputs[2] = {scene.Input(0), scene.Input(1)};
         const Frame expected = RenderScene(scene);

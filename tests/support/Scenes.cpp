@@ -2,7 +2,9 @@
 #include "tests/support/Scenes.h"
 
 #include <algorithm>
+#include <cstdlib>
 #include <cstring>
+#include <numeric>
 
 #include <gtest/gtest.h>
 
@@ -40,6 +42,15 @@ T WholeBetween(Random& random, const ParamDescriptor& param) {
 }
 
 } // namespace
+
+std::vector<uint32_t> Seeds(uint32_t few, uint32_t many) {
+    if (const char* one = std::getenv("KYV_SEED")) {
+        return {static_cast<uint32_t>(std::strtoul(one, nullptr, 10))};
+    }
+    std::vector<uint32_t> seeds(std::getenv("KYV_LONG") ? many : few);
+    std::iota(seeds.begin(), seeds.end(), 0U);
+    return seeds;
+}
 
 std::vector<uint8_t> RandomParams(const EffectDescriptor& effect, Random& random) {
     std::vector<uint8_t> bytes;

@@ -15,6 +15,10 @@ namespace kyvtest {
 
 using Random = std::mt19937;
 
+// The seeds of a random test: a few, or many when KYV_LONG is in the environment, or the one in
+// KYV_SEED, which repeats a failure.
+std::vector<uint32_t> Seeds(uint32_t few, uint32_t many);
+
 struct Scene {
     const EffectDescriptor* effect;
     uint32_t seed;         // names the scene, and draws its input frames
