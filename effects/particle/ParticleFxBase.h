@@ -164,7 +164,9 @@ protected:
     std::vector<Record> m_particles;
 
 private:
-    static constexpr size_t kSnapshotBudget = size_t{64} << 20;
+    // Hours of bubbles. Fireworks fill it, and lose little by what is dropped: nothing there lives
+    // much longer than the time between two snapshots.
+    static constexpr size_t kSnapshotBudget = size_t{16} << 20;
 
     struct Snapshot {
         std::vector<Record> particles;
