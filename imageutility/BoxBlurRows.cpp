@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <cstring>
-#include <new>
 
 namespace kyv {
 namespace {
@@ -35,7 +34,7 @@ void BlurHugeRow(uint8_t* dst, uint32_t* sums, const uint8_t* enter, const uint8
 
 } // namespace
 
-bool CBoxBlurRows::Begin(int32_t width, int32_t height, int32_t radius, InstructionSet set) {
+void CBoxBlurRows::Begin(int32_t width, int32_t height, int32_t radius, InstructionSet set) {
     const bool sameWindows = width == m_nWidth && radius == m_nRadius && m_pSums;
     m_nWidth = width;
     m_nHeight = height;
@@ -58,11 +57,8 @@ bool CBoxBlurRows::Begin(int32_t width, int32_t height, int32_t radius, Instruct
         const size_t bytes = layOut(nullptr);
         if (bytes > m_nBytes) {
             m_nBytes = 0;
-            m_pBlock.reset(new (std::nothrow) CPageBlock(bytes));
-            if (!m_pBlock || !m_pBlock->GetData()) {
-                m_pBlock.reset();
-                return false;
-            }
+            m_pBlock.reset(); // two at a time are never needed
+            m_pBlock = std::make_unique<CPageBlock>(bytes);
             m_nBytes = bytes;
         }
         layOut(m_pBlock->GetData());
@@ -74,10 +70,9 @@ bool CBoxBlurRows::Begin(int32_t width, int32_t height, int32_t radius, Instruct
     } else {
         std::memset(m_pSums, 0, columns * 4 * sumBytes);
     }
-    return true;
 }
 
-bool CBoxBlurRows::BlurImage(const KYVImageUtility::CImageBase& source,
+void CBoxBlurRows::BlurImage(const KYVImageUtility::CImageBase& source,
                              const KYVImageUtility::CImageBase& destination, int32_t radius) {
     const int32_t height = source.GetHeight();
     const int32_t shorter = std::min(source.GetWidth(), height);
@@ -89,11 +84,9 @@ bool CBoxBlurRows::BlurImage(const KYVImageUtility::CImageBase& source,
             std::memcpy(destination.Row(y), source.Row(y),
                         static_cast<size_t>(source.GetWidth()) * 4);
         }
-        return true;
+        return;
     }
-    if (!Begin(source.GetWidth(), height, radius, source.GetInstructionSet())) {
-        return false;
-    }
+    Begin(source.GetWidth(), height, radius, source.GetInstructionSet());
     for (int32_t y = 0; y < radius; ++y) {
         Slide(source.Row(y), nullptr);
     }
@@ -101,7 +94,6 @@ bool CBoxBlurRows::BlurImage(const KYVImageUtility::CImageBase& source,
         Blur(destination.Row(y), y, y + radius < height ? source.Row(y + radius) : nullptr,
              y > radius ? source.Row(y - radius - 1) : nullptr);
     }
-    return true;
 }
 
 void CBoxBlurRows::Slide(const uint8_t* enter, const uint8_t* leave) {

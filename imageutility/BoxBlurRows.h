@@ -18,12 +18,12 @@ namespace kyv {
 class CBoxBlurRows {
 public:
     // Starts with an empty window. radius is at least 1 and less than half of the height; the
-    // shape counts for the next Blurs. False without memory.
-    bool Begin(int32_t width, int32_t height, int32_t radius, InstructionSet set);
+    // shape counts for the next Blurs. Throws std::bad_alloc.
+    void Begin(int32_t width, int32_t height, int32_t radius, InstructionSet set);
 
     // CImageARGB::BoxBlur with memory that is kept; radius is not negative, and the images, which
-    // have one size, must not overlap. False, with nothing written, without memory.
-    bool BlurImage(const KYVImageUtility::CImageBase& source,
+    // have one size, must not overlap. Throws std::bad_alloc, with nothing written.
+    void BlurImage(const KYVImageUtility::CImageBase& source,
                    const KYVImageUtility::CImageBase& destination, int32_t radius);
 
     // Takes a row into the window or out of it. Null for one outside the image.

@@ -2,7 +2,6 @@
 #include "effects/pip/PictureRows.h"
 
 #include <algorithm>
-#include <new>
 
 #include "effects/pip/LayerRows.h"
 #include "imageutility/kernels/ToARGB.h"
@@ -125,9 +124,7 @@ void CPictureRows::Blend(int32_t y, uint8_t* frameRow, uint8_t opacity) {
     }
     const uint8_t* leave = nullptr;
     if (m_nBlurred != y - 1 || y == m_reach.top) {
-        if (!m_window.Begin(m_part.Width(), m_nHeight, radius, m_set)) {
-            throw std::bad_alloc();
-        }
+        m_window.Begin(m_part.Width(), m_nHeight, radius, m_set);
         for (int32_t row = y - radius; row < y + radius; ++row) {
             m_window.Slide(BlurSource(row), nullptr);
         }

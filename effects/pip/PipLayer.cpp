@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <new>
 
 #include "effects/pip/LayerRows.h"
 
@@ -172,9 +171,7 @@ void CPipLayer::MakeRow(int32_t y) {
     }
     const uint8_t* leave = nullptr;
     if (m_nBlurred < 0 || m_nBlurred != y - 1) {
-        if (!m_window.Begin(m_part.Width(), m_recipe.shape.height, radius, m_set)) {
-            throw std::bad_alloc();
-        }
+        m_window.Begin(m_part.Width(), m_recipe.shape.height, radius, m_set);
         m_nSources = y - radius;
         for (int32_t row = y - radius; row < y + radius; ++row) {
             m_window.Slide(BlurSource(row), nullptr);

@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
-#include <new>
 
 #include "effects/style/ShrinkRow.h"
 #include "effects/style/StyleMath.h"
@@ -112,9 +111,7 @@ void CSmallPicture::Blur(float sigma) {
     for (int32_t pass = 0; pass < 3; ++pass) {
         const int32_t r = radius + (pass < wider ? 1 : 0);
         if (r > 0) {
-            if (!m_window.BlurImage(m_image, m_other, r)) {
-                throw std::bad_alloc();
-            }
+            m_window.BlurImage(m_image, m_other, r);
             m_image.Swap(m_other);
         }
     }
