@@ -27,11 +27,9 @@ class Renders : public testing::TestWithParam<const EffectDescriptor*> {};
 INSTANTIATE_TEST_SUITE_P(AllEffects, Renders, testing::ValuesIn(AllEffects()),
                          [](const auto& entry) { return EffectName(*entry.param); });
 
-// Of how many cases a short run takes one: an instance of the pencil sketch draws all its marks
-// first, which takes longer than hundreds of frames of this size.
+// Of how many cases a short run takes one.
 size_t Stride(const EffectDescriptor& effect) {
-    const bool slow = std::strcmp(effect.identifier, "Dsp_Vi_PencilSketch2") == 0;
-    return std::getenv("KYV_LONG") ? 1 : size_t{KYV_STRIDE} * (slow ? 12 : 1);
+    return std::getenv("KYV_LONG") ? 1 : size_t{KYV_STRIDE} * Slowness(effect);
 }
 
 // A scene's frames between pages that nobody may touch. The inputs cannot be written; the output

@@ -52,6 +52,10 @@ std::vector<uint32_t> Seeds(uint32_t few, uint32_t many) {
     return seeds;
 }
 
+uint32_t Slowness(const EffectDescriptor& effect) {
+    return std::strcmp(effect.identifier, "Dsp_Vi_PencilSketch2") == 0 ? 12 : 1;
+}
+
 std::vector<uint8_t> RandomParams(const EffectDescriptor& effect, Random& random) {
     std::vector<uint8_t> bytes;
     for (uint32_t i = 0; i < effect.paramCount; ++i) {

@@ -36,6 +36,10 @@ Scene RandomScene(const EffectDescriptor& effect, uint32_t seed);
 // Names what a failure needs to be repeated.
 std::ostream& operator<<(std::ostream& stream, const Scene& scene);
 
+// How many times as long as the others' an instance's first frame takes: the pencil sketch draws
+// all its marks then, which short runs cannot afford thousands of times.
+uint32_t Slowness(const EffectDescriptor& effect);
+
 // A parameter buffer with values of the declared ranges.
 std::vector<uint8_t> RandomParams(const EffectDescriptor& effect, Random& random);
 
