@@ -5,10 +5,6 @@
 #include <cfenv>
 #include <cstdint>
 
-#if defined(__x86_64__)
-#include <xmmintrin.h>
-#endif
-
 namespace kyv {
 
 // While this lives, its thread computes as every program does when it starts: to nearest, without
@@ -17,16 +13,17 @@ namespace kyv {
 class CFloatEnvironment {
 public:
 #if defined(__x86_64__)
-    CFloatEnvironment() : m_nControl(_mm_getcsr()), m_nFlags(__builtin_ia32_readeflags_u64()) {
+    CFloatEnvironment()
+        : m_nControl(__builtin_ia32_stmxcsr()), m_nFlags(__builtin_ia32_readeflags_u64()) {
         if (m_nFlags & kBackward) {
             __builtin_ia32_writeeflags_u64(m_nFlags & ~kBackward);
         }
         // The C library of one target still computes powers and angles with the old unit.
         __asm__ volatile("fnstenv %0\n\tfninit" : "=m"(m_x87));
-        _mm_setcsr(kDefaultControl);
+        __builtin_ia32_ldmxcsr(kDefaultControl);
     }
     ~CFloatEnvironment() {
-        _mm_setcsr(m_nControl);
+        __builtin_ia32_ldmxcsr(m_nControl);
         __asm__ volatile("fldenv %0" : : "m"(m_x87));
         if (m_nFlags & kBackward) {
             __builtin_ia32_writeeflags_u64(__builtin_ia32_readeflags_u64() | kBackward);

@@ -6,7 +6,6 @@
 #include "threading/ThreadPool.h"
 
 #if defined(__x86_64__)
-#include <xmmintrin.h>
 
 namespace {
 
@@ -39,16 +38,16 @@ HostState RunIn(const HostState& state, const char* name, Call&& call) {
     HostState after = {name, 0, 0, false};
     uint64_t flags = 0;
     __asm__ volatile("fninit\n\tfldcw %0" : : "m"(state.oldControl));
-    _mm_setcsr(state.control);
+    __builtin_ia32_ldmxcsr(state.control);
     if (state.backward) {
         __asm__ volatile("std" : : : "cc", "memory");
     }
     call();
     flags = __builtin_ia32_readeflags_u64();
     __asm__ volatile("cld" : : : "cc", "memory");
-    after.control = _mm_getcsr();
+    after.control = __builtin_ia32_stmxcsr();
     __asm__ volatile("fnstcw %0" : "=m"(after.oldControl));
-    _mm_setcsr(kUsual.control);
+    __builtin_ia32_ldmxcsr(kUsual.control);
     __asm__ volatile("fninit\n\tfldcw %0" : : "m"(kUsual.oldControl));
     after.backward = (flags & 0x400) != 0;
     return after;
@@ -128,7 +127,7 @@ TEST(HostStates, DoNotReachTheWorkers) {
         uint32_t result = 0;
         pool.QueueJob(
             [](void* argument) -> uint32_t {
-                *static_cast<uint32_t*>(argument) = _mm_getcsr();
+                *static_cast<uint32_t*>(argument) = __builtin_ia32_stmxcsr();
                 return 0;
             },
             &seen, &id);

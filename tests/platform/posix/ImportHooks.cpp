@@ -12,6 +12,14 @@
 namespace kyvtest {
 namespace {
 
+#if defined(__aarch64__)
+constexpr auto kJumpSlot = R_AARCH64_JUMP_SLOT;
+constexpr auto kDataSlot = R_AARCH64_GLOB_DAT;
+#else
+constexpr auto kJumpSlot = R_X86_64_JUMP_SLOT;
+constexpr auto kDataSlot = R_X86_64_GLOB_DAT;
+#endif
+
 struct Search {
     const char* name;
     void* replacement;
@@ -79,7 +87,7 @@ int ReplaceIn(dl_phdr_info* info, size_t, void* argument) {
             const ElfW(Rela)& entry = tables[table][i];
             const auto type = ELF64_R_TYPE(entry.r_info);
             const ElfW(Sym)& symbol = symbols[ELF64_R_SYM(entry.r_info)];
-            if ((type == R_X86_64_JUMP_SLOT || type == R_X86_64_GLOB_DAT) &&
+            if ((type == kJumpSlot || type == kDataSlot) &&
                 std::strcmp(strings + symbol.st_name, search.name) == 0) {
                 Replace(reinterpret_cast<void**>(info->dlpi_addr + entry.r_offset),
                         search.replacement);
