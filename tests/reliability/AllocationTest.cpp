@@ -2,6 +2,7 @@
 // the next call that gets its memory is right.
 #include <array>
 #include <atomic>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <functional>
