@@ -7,7 +7,7 @@ namespace kyvtest {
 
 void LeaveBehind() {
     if (fork() == 0) {
-        execl("/proc/self/exe", "lingerer", "stay", nullptr);
+        execl(KYV_LINGERER_FILE, "lingerer", "stay", nullptr);
         _exit(1);
     }
 }
