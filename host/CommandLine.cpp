@@ -102,7 +102,7 @@ fs::path ParsePath(std::string_view what, std::string_view text) {
 // and an installation have it.
 fs::path DefaultModuleFile() {
     const fs::path folder = kyv::ExecutableFile().parent_path();
-    const fs::path file = FindModuleFile({folder, folder / "../module", folder / "../lib"});
+    fs::path file = FindModuleFile({folder, folder / "../module", folder / "../lib"});
     if (file.empty()) {
         throw CModuleError("no " KYV_MODULE_NAME " beside " + TextOf(folder / "kyvhost") +
                            "; name the module with --module FILE");

@@ -38,8 +38,8 @@ struct Six {
 
 template <class Param>
 struct ParamRow {
-    Param param; // where its effect expects it
     Key key, nameKey, descKey;
+    Param param; // where its effect expects it
     ParamType type;
     ParamControl control;
     uint32_t valueSize, flag, group;
@@ -55,10 +55,10 @@ constexpr auto ColorPicker = ParamControl_ColorPicker;
 template <class Param, class T>
 consteval ParamRow<Param> Row(ParamType type, ParamControl control, Param param, Key key, Key name,
                               Key desc, uint32_t flag, uint32_t group, const Six<T>& six) {
-    return {param,
-            key,
+    return {key,
             name,
             desc,
+            param,
             type,
             control,
             sizeof(T),

@@ -18,6 +18,9 @@ inline constexpr size_t kMaxPathUnits = 260;
 // The library, or the program, that this code is linked into. The reference stays its loader's.
 LibraryHandle OwnLibrary();
 
+// Keeps that library in the process to its end, whoever unloads it.
+void KeepOwnLibrary();
+
 // How many units of a path count towards that: UTF-16 units on Windows; on Linux characters of
 // UTF-8, and every byte that belongs to none.
 size_t CountPathUnits(const NativeString& path);

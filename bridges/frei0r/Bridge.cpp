@@ -33,7 +33,7 @@ fs::path ModuleFile() {
         return kyvhosting::PathOf(named);
     }
     const fs::path folder = fs::path(kyv::LibraryFileName(kyv::OwnLibrary())).parent_path();
-    const fs::path file = kyvhosting::FindModuleFile(
+    fs::path file = kyvhosting::FindModuleFile(
         {folder, folder / "..", folder / "../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)});
     if (file.empty()) {
         throw kyvhosting::CModuleError(
@@ -43,11 +43,14 @@ fs::path ModuleFile() {
     return file;
 }
 
-// Loaded once for each plug-in, at its first instance, and kept: hosts load and unload plug-ins at
-// moments when the module may not be unloaded (from a library's own unloading, say), and all
-// plug-ins of a process share the one that the system has loaded.
+// Loaded once for each plug-in, at its first instance, and kept, as the plug-in itself is: hosts
+// load and unload plug-ins at moments when the module may not be unloaded (from a library's own
+// unloading, say), and all plug-ins of a process share the one that the system has loaded.
 const kyvhosting::CModule& Module() {
-    static const kyvhosting::CModule* const module = new kyvhosting::CModule(ModuleFile());
+    static const kyvhosting::CModule* const module = [] {
+        kyv::KeepOwnLibrary();
+        return new kyvhosting::CModule(ModuleFile());
+    }();
     return *module;
 }
 

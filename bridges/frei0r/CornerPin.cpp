@@ -130,11 +130,13 @@ void CCornerPin::Compose(uint8_t* output, const uint8_t* alpha) const {
         const uint32_t total = part + behind;
         output[i + 3] = static_cast<uint8_t>(total);
         for (size_t k = 0; k < 3; ++k) {
-            const uint32_t own =
-                covered ? std::min<uint32_t>((black[i + k] * 255U + covered / 2) / covered, 255)
-                        : 0;
-            const uint32_t sum = own * part + color[k] * behind;
-            output[i + k] = static_cast<uint8_t>(total ? (sum + total / 2) / total : color[k]);
+            uint32_t value = color[k];
+            if (part > 0) {
+                const uint32_t own =
+                    std::min<uint32_t>((black[i + k] * 255U + covered / 2) / covered, 255);
+                value = (own * part + value * behind + total / 2) / total;
+            }
+            output[i + k] = static_cast<uint8_t>(value);
         }
     }
 }

@@ -74,7 +74,7 @@ CEffectPlugin::CEffectPlugin(const PluginTable& table, const EffectDescriptor& e
     kyvhosting::Require(m_instance.Init(), effect, "InitInstance");
     for (int i = 0; i < table.paramCount; ++i) {
         if (table.params[i].ownDefault) {
-            CEffectPlugin::SetParam(i, &table.params[i].initial);
+            SetValue(table.params[i], &table.params[i].initial);
         }
     }
 }
@@ -89,6 +89,13 @@ void CEffectPlugin::SetParam(int index, const void* value) noexcept {
     }
     const std::lock_guard lock(m_mutex);
     const ParamTable& table = m_table.params[index];
+    if (!SetValue(table, value)) {
+        SetOwn(table, value);
+    }
+}
+
+// False for a parameter that the effect does not have.
+bool CEffectPlugin::SetValue(const ParamTable& table, const void* value) {
     const ParamDescriptor& param = m_instance.Effect().params[table.index];
     uint8_t* const bytes = m_instance.Value(table.index);
     switch (table.mapping) {
@@ -123,9 +130,9 @@ void CEffectPlugin::SetParam(int index, const void* value) noexcept {
         break;
     }
     default:
-        SetOwn(table, value);
-        break;
+        return false;
     }
+    return true;
 }
 
 void CEffectPlugin::GetParam(int index, void* value) noexcept {

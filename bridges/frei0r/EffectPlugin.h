@@ -37,6 +37,7 @@ protected:
     const kyvhosting::CInstance& Instance() const { return m_instance; }
 
 private:
+    bool SetValue(const ParamTable& param, const void* value);
     bool SetTime(double time, const void* caller);
     KyvStatus RenderChecked(const void* input0, const void* input1, void* output);
     void Complain(const char* what, KyvStatus status);

@@ -58,7 +58,10 @@ std::string_view UserLocale() {
 
 } // namespace
 
-LibraryHandle OwnLibrary() {
+namespace {
+
+// The handle of the library that this code is linked into, which stays counted as it was.
+void* OpenSelf(int flags) {
     Dl_info info;
     link_map* map = nullptr;
     if (!dladdr1(kLanguageNames, &info, reinterpret_cast<void**>(&map), RTLD_DL_LINKMAP)) {
@@ -66,11 +69,21 @@ LibraryHandle OwnLibrary() {
     }
     // It is loaded already, so this only yields the handle; closing it again leaves the count as
     // it was. The program comes first in the list and is opened without a name.
-    void* const self = dlopen(map->l_prev ? map->l_name : nullptr, RTLD_LAZY | RTLD_NOLOAD);
+    void* const self = dlopen(map->l_prev ? map->l_name : nullptr, RTLD_LAZY | RTLD_NOLOAD | flags);
     if (self) {
         dlclose(self);
     }
     return self;
+}
+
+} // namespace
+
+LibraryHandle OwnLibrary() {
+    return OpenSelf(0);
+}
+
+void KeepOwnLibrary() {
+    OpenSelf(RTLD_NODELETE);
 }
 
 namespace {

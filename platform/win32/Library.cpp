@@ -13,6 +13,12 @@ LibraryHandle OwnLibrary() {
     return &__ImageBase;
 }
 
+void KeepOwnLibrary() {
+    HMODULE self = nullptr;
+    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_PIN,
+                       reinterpret_cast<LPCWSTR>(&__ImageBase), &self);
+}
+
 size_t CountPathUnits(const NativeString& path) {
     return path.size();
 }
