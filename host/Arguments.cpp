@@ -105,4 +105,31 @@ Size ParseSize(std::string_view what, std::string_view text) {
     return ParsePair(what, text, 'x', 32768, "a size, such as 1920x1080, up to 32768x32768");
 }
 
+std::vector<std::string> SplitWords(std::string_view what, std::string_view text) {
+    std::vector<std::string> words;
+    bool inWord = false;
+    char quote = 0;
+    for (const char c : text) {
+        if (quote == 0 && c == ' ') {
+            inWord = false;
+            continue;
+        }
+        if (!inWord) {
+            words.emplace_back();
+            inWord = true;
+        }
+        if (quote == 0 && (c == '"' || c == '\'')) {
+            quote = c;
+        } else if (c == quote) {
+            quote = 0;
+        } else {
+            words.back() += c;
+        }
+    }
+    if (quote != 0) {
+        Refuse(what, text, "complete: a quote has no end");
+    }
+    return words;
+}
+
 } // namespace kyvhost

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -22,6 +23,9 @@ Rational ParseRate(std::string_view what, std::string_view text);
 
 // "16:9"
 Size ParseAspect(std::string_view what, std::string_view text);
+
+// Words with spaces between; quotes of either kind keep spaces in a word.
+std::vector<std::string> SplitWords(std::string_view what, std::string_view text);
 
 // "1920x1080"
 Size ParseSize(std::string_view what, std::string_view text);

@@ -81,7 +81,8 @@ void Bench(const ModuleDescriptor& module, const BenchOptions& options) {
     const FrameForm form = {options.settings.ayuv, false};
     const auto first = StillSource(Pattern(options.size, 1), form);
     const auto second = StillSource(Pattern(options.size, 2), form);
-    const uint8_t* const inputs[2] = {first->Next(), second->Next()};
+    const std::optional<TimedFrame> firstFrame = first->Next(), secondFrame = second->Next();
+    const uint8_t* const inputs[2] = {firstFrame->pixels->data(), secondFrame->pixels->data()};
     std::vector<uint8_t> output(shape.Bytes());
     std::vector<double> copies;
 

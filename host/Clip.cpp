@@ -1,6 +1,7 @@
 // Streams of frames.
 #include "host/Clip.h"
 
+#include <cmath>
 #include <cstring>
 #include <utility>
 
@@ -10,16 +11,19 @@ namespace kyvhost {
 namespace {
 
 // Enough that a slow frame on one side does not stop the other.
-constexpr int kFramesAhead = 4;
+constexpr size_t kFramesAhead = 3;
 
 class CStillSource : public CFrameSource {
 public:
-    explicit CStillSource(Frame&& frame) : m_frame(std::move(frame)) {}
+    explicit CStillSource(Frame&& frame) : m_frame(std::make_shared<Frame>(std::move(frame))) {}
 
-    const uint8_t* Next() override { return m_frame.data(); }
+    std::optional<TimedFrame> Next() override {
+        return m_frame ? std::optional(TimedFrame{std::exchange(m_frame, nullptr), 0})
+                       : std::nullopt;
+    }
 
 private:
-    Frame m_frame;
+    FramePtr m_frame; // until it has been given
 };
 
 class CVideoSource : public CFrameSource {
@@ -27,45 +31,40 @@ public:
     CVideoSource(std::unique_ptr<CVideoReader> reader, uint32_t width, uint32_t height,
                  const FrameForm& form)
         : m_pReader(std::move(reader)), m_nWidth(width), m_fileBytes(size_t{width} * height * 4),
-          m_form(form) {
-        for (int i = 0; i < kFramesAhead; ++i) {
-            m_free.Push(Frame());
-        }
+          m_form(form), m_pPool(CFramePool::Make()), m_filled(kFramesAhead) {
         m_thread = std::thread([this] { ReadFrames(); });
     }
 
     ~CVideoSource() override {
-        m_free.Close();
+        m_filled.Close();
         m_pReader->Abort();
         Join();
     }
 
-    const uint8_t* Next() override {
-        std::optional<Frame> frame = m_filled.Pop();
+    std::optional<TimedFrame> Next() override {
+        std::optional<TimedFrame> frame = m_filled.Pop();
         if (!frame) {
             Join();
             if (m_error) {
                 std::rethrow_exception(m_error);
             }
-            return nullptr;
         }
-        m_current.swap(*frame);
-        if (!frame->empty()) {
-            m_free.Push(std::move(*frame));
-        }
-        return m_current.data();
+        return frame;
     }
 
 private:
     void ReadFrames() {
         try {
-            while (std::optional<Frame> frame = m_free.Pop()) {
-                frame->resize(m_fileBytes);
-                if (!m_pReader->Read(frame->data())) {
+            for (;;) {
+                TimedFrame frame = {m_pPool->Take()};
+                frame.pixels->resize(m_fileBytes);
+                if (!m_pReader->Read(frame.pixels->data(), frame.seconds)) {
                     break;
                 }
-                m_form.Apply(*frame, m_nWidth);
-                m_filled.Push(std::move(*frame));
+                m_form.Apply(*frame.pixels, m_nWidth);
+                if (!m_filled.Push(std::move(frame))) {
+                    break;
+                }
             }
         } catch (...) {
             m_error = std::current_exception();
@@ -83,8 +82,8 @@ private:
     uint32_t m_nWidth;
     size_t m_fileBytes;
     FrameForm m_form;
-    CFrameQueue m_free, m_filled;
-    Frame m_current;
+    std::shared_ptr<CFramePool> m_pPool;
+    CQueue<TimedFrame> m_filled;
     std::exception_ptr m_error; // the reader thread's until it has been joined
     std::thread m_thread;
 };
@@ -119,11 +118,35 @@ std::unique_ptr<CFrameSource> VideoSource(std::unique_ptr<CVideoReader> reader, 
     return std::make_unique<CVideoSource>(std::move(reader), width, height, form);
 }
 
-CFrameSink::CFrameSink(std::unique_ptr<CVideoWriter> writer, size_t frameBytes, bool ayuv)
-    : m_pWriter(std::move(writer)), m_frameBytes(frameBytes), m_bAyuv(ayuv) {
-    for (int i = 0; i < kFramesAhead; ++i) {
-        m_free.Push(Frame(m_frameBytes));
+CFollower::CFollower(std::unique_ptr<CFrameSource> source, const Rational& rate,
+                     double frameSeconds)
+    : m_pSource(std::move(source)), m_rate(rate), m_fFrameSeconds(frameSeconds) {}
+
+double CFollower::Slot(double seconds) const {
+    return std::round(seconds * m_rate.Value());
+}
+
+FramePtr CFollower::At(double seconds) {
+    if (!m_bStarted) {
+        m_bStarted = true;
+        m_current = m_pSource->Next();
+        m_fFirst = m_current ? m_current->seconds : 0;
+        m_next = m_current ? m_pSource->Next() : std::nullopt;
     }
+    const double slot = Slot(seconds);
+    while (m_next && Slot(m_next->seconds - m_fFirst) <= slot) {
+        m_current = std::move(m_next);
+        m_next = m_pSource->Next();
+    }
+    if (!m_current ||
+        (!m_next && slot >= Slot(m_current->seconds - m_fFirst + m_fFrameSeconds) && slot > 0)) {
+        return nullptr;
+    }
+    return m_current->pixels;
+}
+
+CFrameSink::CFrameSink(std::unique_ptr<CVideoWriter> writer, bool ayuv)
+    : m_pWriter(std::move(writer)), m_bAyuv(ayuv), m_filled(kFramesAhead) {
     m_thread = std::thread([this] { WriteFrames(); });
 }
 
@@ -135,16 +158,11 @@ CFrameSink::~CFrameSink() {
     }
 }
 
-Frame CFrameSink::Take() {
-    std::optional<Frame> frame = m_free.Pop();
-    if (!frame) {
-        Rethrow();
+void CFrameSink::Put(FramePtr frame, int64_t nanoseconds) {
+    if (!m_filled.Push({std::move(frame), nanoseconds})) {
+        m_thread.join();
+        std::rethrow_exception(m_error); // nothing else closes the queue before its end
     }
-    return std::move(*frame);
-}
-
-void CFrameSink::Put(Frame&& frame) {
-    m_filled.Push(std::move(frame));
 }
 
 void CFrameSink::Finish() {
@@ -158,23 +176,16 @@ void CFrameSink::Finish() {
 
 void CFrameSink::WriteFrames() {
     try {
-        while (std::optional<Frame> frame = m_filled.Pop()) {
+        while (std::optional<Item> item = m_filled.Pop()) {
             if (m_bAyuv) {
-                AyuvToBgra(frame->data(), frame->size() / 4);
+                AyuvToBgra(item->frame->data(), item->frame->size() / 4);
             }
-            m_pWriter->Write(frame->data());
-            m_free.Push(std::move(*frame));
+            m_pWriter->Write(item->frame->data(), item->nanoseconds);
         }
     } catch (...) {
         m_error = std::current_exception();
-        m_free.Close();
+        m_filled.Close();
     }
-}
-
-// The free frames end only when the writer thread has failed.
-void CFrameSink::Rethrow() {
-    m_thread.join();
-    std::rethrow_exception(m_error);
 }
 
 } // namespace kyvhost

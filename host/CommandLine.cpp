@@ -17,6 +17,7 @@
 #include "host/Gallery.h"
 #include "host/Hosting.h"
 #include "host/Render.h"
+#include "host/VideoFormats.h"
 #include "hosting/Error.h"
 #include "hosting/Module.h"
 #include "hosting/Names.h"
@@ -77,6 +78,22 @@ size_t ParseWord(std::string_view what, std::string_view text,
     }
     throw CUsageError(std::string(what) + ": " + Quoted(text) + " is not one of " +
                       Join(words, ", "));
+}
+
+// "10,20" or "10,20,5"
+Pick ParsePick(std::string_view what, const std::string& text) {
+    const std::vector<std::string> parts = Split(text, ',');
+    if (parts.size() != 2 && parts.size() != 3) {
+        throw CUsageError(std::string(what) + ": " + Quoted(text) +
+                          " is not a spot, such as 640,360 or 640,360,12");
+    }
+    Pick pick;
+    pick.x = ParseWhole<uint32_t>(what, parts[0], 0, 32767);
+    pick.y = ParseWhole<uint32_t>(what, parts[1], 0, 32767);
+    if (parts.size() == 3) {
+        pick.radius = ParseWhole<uint32_t>(what, parts[2], 0, 1000);
+    }
+    return pick;
 }
 
 int32_t ParseLevel(std::string_view text) {
@@ -158,8 +175,8 @@ private:
 
     // An option that a function reads; text that is not given is never read.
     template <class Read>
-    CLI::Option* AddText(CLI::App* verb, const char* name, const char* type, const char* what,
-                         Read&& read) {
+    CLI::Option* AddText(CLI::App* verb, const char* name, const char* type,
+                         const std::string& what, Read&& read) {
         return verb
             ->add_option_function<std::string>(
                 name, [read](const std::string& text) { read(text); }, what)
@@ -173,7 +190,7 @@ private:
     }
 
     void AddSettings(CLI::App* verb) {
-        EffectSettings& settings = m_render.settings;
+        EffectSettings& settings = m_stage.settings;
         verb->add_option("--set", settings.sets, "a parameter's value; repeatable")
             ->type_name("NAME=VALUE")
             ->allow_extra_args(false);
@@ -203,7 +220,7 @@ private:
     }
 
     void AddCommonSettings(CLI::App* verb) {
-        EffectSettings& settings = m_render.settings;
+        EffectSettings& settings = m_stage.settings;
         AddText(verb, "--format", "argb|ayuv", "pixel format of the effect's frames; default: argb",
                 [&settings](const std::string& text) {
                     settings.ayuv = ParseWord("--format", text, {"argb", "ayuv"}) == 1;
@@ -217,7 +234,7 @@ private:
     void AddLevel(CLI::App* verb) {
         AddText(verb, "--level", "0..5",
                 "instruction sets: below 3 none, 3 SSE2, 4 and 5 the best there is; default: 5",
-                [this](const std::string& text) { m_render.settings.level = ParseLevel(text); });
+                [this](const std::string& text) { m_stage.settings.level = ParseLevel(text); });
     }
 
     void AddJson(CLI::App* verb) { verb->add_flag("--json", m_bJson, "JSON instead of a table"); }
@@ -240,27 +257,30 @@ private:
                                        &CCommandLine::RenderFile);
         verb->footer(kRenderFooter);
         AddEffect(verb);
-        verb->add_option("INPUT", m_input,
-                         "a PNG, JPEG, TIFF or BMP picture, or a video that ffmpeg reads")
+        verb->add_option(
+                "INPUT", m_input,
+                "a picture, a video that ffmpeg reads, numbered pictures (shot-%04d.png), or - for "
+                "standard input: y4m, NUT, or raw BGRA with --size and --rate")
             ->required()
             ->type_name("");
         verb->add_option("OUTPUT", m_output,
-                         "a .png, .jpg, .tif or .bmp picture, or a .mp4, .m4v, .mov or .mkv video")
+                         "a .png, .jpg, .tif or .bmp picture, a video (" + VideoEndings() +
+                             "), numbered pictures, or - for standard output")
             ->required()
             ->type_name("");
         AddText(
             verb, "--input2", "FILE",
             "the second input of a transition, or the inner picture; takes the first one's size",
-            [this](const std::string& text) { m_render.input2 = ParsePath("--input2", text); });
+            [this](const std::string& text) { m_stage.input2 = ParsePath("--input2", text); });
         AddSettings(verb);
         AddLevel(verb);
-        verb->add_option("--animate", m_render.animations,
+        verb->add_option("--animate", m_stage.animations,
                          "a parameter that changes over the clip; repeatable")
             ->type_name("NAME=FROM:TO[:EASING]")
             ->allow_extra_args(false);
         AddText(verb, "--easing", "NAME",
                 "of animations: linear, in, out or in-out; default: linear",
-                [this](const std::string& text) { m_render.easing = ParseEasing(text); });
+                [this](const std::string& text) { m_stage.easing = ParseEasing(text); });
         AddText(verb, "--time", "TIME", "the moment to show in a picture; default: the middle",
                 [this](const std::string& text) { m_render.time = ParseTime("--time", text); });
         AddText(verb, "--start", "TIME", "where in the videos to begin",
@@ -288,19 +308,48 @@ private:
                                           ? Stereo::SideBySide
                                           : Stereo::Split;
                 });
-        AddText(verb, "--field", "first|second|both", "render only these rows, field by field",
+        AddText(verb, "--field", "auto|frame|first|second|both",
+                "auto renders frames of two fields field by field; frame renders all as they are; "
+                "the others only these rows; default: auto",
                 [this](const std::string& text) {
-                    const size_t field = ParseWord("--field", text, {"first", "second", "both"});
-                    m_render.settings.firstField = field != 1;
-                    m_render.settings.secondField = field != 0;
+                    const size_t field =
+                        ParseWord("--field", text, {"auto", "frame", "first", "second", "both"});
+                    m_render.fields = field == 0 ? FieldUse::AsVideo : FieldUse::Frames;
+                    m_stage.settings.firstField = field == 2 || field == 4;
+                    m_stage.settings.secondField = field >= 3;
                 });
-        AddText(verb, "--codec", "h264|ffv1",
-                "of a video: for watching, or every byte kept in a .mkv; default: h264",
+        AddText(verb, "--codec", "NAME",
+                "of a video: " + Join(CodecNames(), ", ") +
+                    "; default: what suits the file, with alpha where the input has it",
+                [this](const std::string& text) { m_render.codec = FindCodec(text).name; });
+        AddText(verb, "--output-format", "ENDING",
+                "of standard output, or where the name does not tell: nut, y4m, raw, mkv, ...; "
+                "default: nut",
+                [this](const std::string& text) { m_render.outputFormat = text; });
+        AddText(verb, "--encoder-options", "TEXT",
+                "handed to ffmpeg behind our own, such as \"-crf 14 -preset slow\"; repeatable",
                 [this](const std::string& text) {
-                    m_render.codec = ParseWord("--codec", text, {"h264", "ffv1"}) == 0
-                                         ? VideoCodec::H264
-                                         : VideoCodec::Ffv1;
+                    const std::vector<std::string> words = SplitWords("--encoder-options", text);
+                    m_render.encoderOptions.insert(m_render.encoderOptions.end(), words.begin(),
+                                                   words.end());
+                })
+            ->take_all()
+            ->allow_extra_args(false);
+        AddText(verb, "--size", "WxH", "of raw BGRA frames that come over a pipe, with --rate",
+                [this](const std::string& text) { m_render.size = ParseSize("--size", text); });
+        AddText(
+            verb, "--pick", "X,Y[,RADIUS]",
+            "a grey spot of the input, whose mean becomes the reference colour of white-balance",
+            [this](const std::string& text) { m_render.pick = ParsePick("--pick", text); });
+        AddText(verb, "--offset", "TIME", "where in its animation the effect begins; default: 0",
+                [this](const std::string& text) { m_render.offset = ParseTime("--offset", text); });
+        AddText(verb, "--jobs", "N",
+                "frames that are rendered at a time, each with memory of its own; default: as many "
+                "as the processor has cores",
+                [this](const std::string& text) {
+                    m_render.jobs = ParseWhole<uint32_t>("--jobs", text, 1, 256);
                 });
+        verb->add_flag("--strict", m_render.strict, "what cannot be kept is an error");
         AddText(verb, "--ffmpeg", "FILE", "the program ffmpeg; ffprobe lies beside it",
                 [this](const std::string& text) {
                     m_render.tools.ffmpeg = TextOf(ParsePath("--ffmpeg", text));
@@ -367,7 +416,8 @@ private:
     }
 
     void RenderFile() {
-        m_render.effect = m_effect;
+        m_stage.effect = m_effect;
+        m_render.stages = {m_stage};
         m_render.input = ParsePath("INPUT", m_input);
         m_render.output = ParsePath("OUTPUT", m_output);
         m_render.overwrite = m_bOverwrite;
@@ -377,7 +427,7 @@ private:
 
     void BenchEffect() {
         m_bench.effect = m_effect;
-        m_bench.settings = m_render.settings;
+        m_bench.settings = m_stage.settings;
         m_bench.json = m_bJson;
         const CModule module = Load();
         Bench(module.Descriptor(), m_bench);
@@ -387,7 +437,7 @@ private:
         m_gallery.input = ParsePath("INPUT", m_input);
         m_gallery.input2 = ParsePath("INPUT2", m_input2);
         m_gallery.output = ParsePath("OUTPUT", m_output);
-        m_gallery.settings = m_render.settings;
+        m_gallery.settings = m_stage.settings;
         m_gallery.overwrite = m_bOverwrite;
         const CModule module = Load();
         Gallery(module.Descriptor(), m_gallery);
@@ -439,6 +489,7 @@ private:
     bool m_bJson = false;
     bool m_bOverwrite = false;
     RenderOptions m_render;
+    StageOptions m_stage;
     BenchOptions m_bench;
     GalleryOptions m_gallery;
 };

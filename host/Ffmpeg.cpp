@@ -36,13 +36,13 @@ auto Started(const std::string& program, const std::string& option, ExitStatus s
 
 CFfmpeg::CFfmpeg(const std::string& program, const std::string& option,
                  const std::vector<std::string>& arguments, kyv::ChildStream input,
-                 kyv::ChildStream output, ExitStatus status)
+                 kyv::ChildStream output, ExitStatus status, std::shared_ptr<ILineTaker> lineTaker)
     : m_process(Started(program, option, status,
                         [&] {
                             return kyv::CProcess(program, arguments, input, output,
                                                  kyv::ChildStream::Pipe);
                         })),
-      m_collector([this] { CollectLines(); }), m_guard([this] {
+      m_pLineTaker(std::move(lineTaker)), m_collector([this] { CollectLines(); }), m_guard([this] {
           m_process.Kill();
           m_process.Wait();
       }) {}
@@ -62,10 +62,12 @@ int CFfmpeg::Wait() {
     return status;
 }
 
-std::string CFfmpeg::LastLine() const {
+std::string CFfmpeg::LastLineAbout(const std::string& file) const {
     for (auto line = m_lines.rbegin(); line != m_lines.rend(); ++line) {
-        if (*line != "Conversion failed!") { // follows every error and explains none
-            return *line;
+        // These follow every error and explain none.
+        if (*line != "Conversion failed!" && !line->starts_with("Error initializing output")) {
+            const size_t at = line->find(file + ": ");
+            return at == std::string::npos ? *line : line->substr(at + file.size() + 2);
         }
     }
     return {};
@@ -86,17 +88,30 @@ void CFfmpeg::CollectLines() {
                 line += c;
                 continue;
             }
-            if (!line.empty()) {
-                m_lines.push_back(std::exchange(line, {}));
+            if (!line.empty() && !(m_pLineTaker && m_pLineTaker->Take(line))) {
+                m_lines.push_back(line);
             }
+            line.clear();
             if (m_lines.size() > kLinesKept) {
                 m_lines.pop_front();
             }
         }
     }
-    if (!line.empty()) {
+    if (!line.empty() && !(m_pLineTaker && m_pLineTaker->Take(line))) {
         m_lines.push_back(line);
     }
+    if (m_pLineTaker) {
+        m_pLineTaker->End();
+    }
+}
+
+void FeedFromPipe(std::shared_ptr<CFfmpeg> ffmpeg, std::shared_ptr<CInputPipe> pipe, bool keep) {
+    std::thread([ffmpeg = std::move(ffmpeg), pipe = std::move(pipe), keep] {
+        pipe->Pass(
+            [&](const void* data, size_t size) { return ffmpeg->Process().WriteInput(data, size); },
+            keep);
+        ffmpeg->Process().CloseInput();
+    }).detach();
 }
 
 } // namespace kyvhost

@@ -93,8 +93,10 @@ Tile RenderTile(const EffectDescriptor& effect, const EffectSettings& settings,
     instance.Context().duration = std::llround(kClipSeconds * 1e7);
 
     const FrameForm form = {settings.ayuv, false};
-    const auto firstFrames = StillSource(first, form), secondFrames = StillSource(second, form);
-    const uint8_t* const inputs[2] = {firstFrames->Next(), secondFrames->Next()};
+    Frame firstFrame = first.pixels, secondFrame = second.pixels;
+    form.Apply(firstFrame, first.width);
+    form.Apply(secondFrame, second.width);
+    const uint8_t* const inputs[2] = {firstFrame.data(), secondFrame.data()};
     Picture result = {first.width, first.height, std::vector<uint8_t>(first.pixels.size())};
     instance.Begin({first.width, first.height, false});
     instance.Render(inputs, result.pixels.data(), 0);

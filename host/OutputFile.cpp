@@ -7,6 +7,7 @@
 #include <system_error>
 
 #include "host/ExitStatus.h"
+#include "host/FileNames.h"
 #include "hosting/Hex.h"
 #include "hosting/Text.h"
 
@@ -104,6 +105,85 @@ void COutputFile::Commit() {
     fs::rename(m_temporary, m_target, error);
     if (error) {
         Unwritable(m_file, error.message());
+    }
+}
+
+COutputSequence::COutputSequence(const fs::path& pattern, bool overwrite,
+                                 const std::vector<fs::path>& inputs)
+    : m_pattern(pattern),
+      m_folder(pattern.parent_path() / PathOf(".part-" + Hex(std::random_device()()).substr(2))),
+      m_temporary(m_folder / pattern.filename()), m_inputs(inputs), m_bOverwrite(overwrite),
+      m_guard([name = m_folder] {
+          std::error_code error;
+          fs::remove_all(name, error);
+      }) {
+    std::error_code error;
+    const fs::path folder = fs::absolute(pattern).parent_path();
+    if (!fs::exists(folder, error)) {
+        Unwritable(pattern, "the folder " + TextOf(folder) + " does not exist");
+    }
+    for (const fs::path& input : inputs) {
+        if (fs::absolute(input) == fs::absolute(pattern)) {
+            throw CUsageError(TextOf(pattern) + " is the input; name other files for the result");
+        }
+    }
+    Check(SequenceFile(pattern, 1));
+    if (!fs::create_directory(m_folder, error)) {
+        Unwritable(pattern, error.message());
+    }
+}
+
+COutputSequence::~COutputSequence() {
+    std::error_code error;
+    fs::remove_all(m_folder, error);
+}
+
+void COutputSequence::Check(const fs::path& file) const {
+    std::error_code error;
+    for (const fs::path& input : m_inputs) {
+        if (fs::equivalent(input, file, error)) {
+            throw CUsageError(TextOf(file) + " is an input; name other files for the result");
+        }
+    }
+    if (fs::exists(file, error) && !m_bOverwrite) {
+        Exists(file);
+    }
+}
+
+void COutputSequence::Commit() {
+    std::error_code error;
+    std::vector<fs::path> names;
+    for (const fs::directory_entry& entry : fs::directory_iterator(m_folder)) {
+        names.push_back(entry.path().filename());
+        Check(m_pattern.parent_path() / names.back());
+    }
+    for (const fs::path& name : names) {
+        const fs::path place = m_pattern.parent_path() / name;
+        fs::rename(m_folder / name, place, error);
+        if (error) {
+            Unwritable(place, error.message());
+        }
+    }
+}
+
+COutput::COutput(const fs::path& file, bool overwrite, const std::vector<fs::path>& inputs)
+    : m_name(file) {
+    if (IsSequenceName(file)) {
+        m_pSequence = std::make_unique<COutputSequence>(file, overwrite, inputs);
+    } else if (!IsDash(file)) {
+        m_pFile = std::make_unique<COutputFile>(file, overwrite, inputs);
+    }
+}
+
+const fs::path& COutput::Temporary() const {
+    return m_pFile ? m_pFile->Temporary() : m_pSequence ? m_pSequence->Temporary() : m_name;
+}
+
+void COutput::Commit() {
+    if (m_pFile) {
+        m_pFile->Commit();
+    } else if (m_pSequence) {
+        m_pSequence->Commit();
     }
 }
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <filesystem>
+#include <memory>
 #include <vector>
 
 #include "host/Interrupt.h"
@@ -36,6 +37,50 @@ private:
     std::filesystem::path m_temporary;
     bool m_bOverwrite;
     CInterruptGuard m_guard;
+};
+
+// Numbered files, shot-%04d.png. They are made in a folder of their own beside their place, which
+// goes at the end.
+class COutputSequence {
+public:
+    // Throws as COutputFile does, also when a file of the sequence is there already.
+    COutputSequence(const std::filesystem::path& pattern, bool overwrite,
+                    const std::vector<std::filesystem::path>& inputs);
+    ~COutputSequence();
+
+    COutputSequence(const COutputSequence&) = delete;
+    COutputSequence& operator=(const COutputSequence&) = delete;
+
+    // The pattern below the folder.
+    const std::filesystem::path& Temporary() const { return m_temporary; }
+
+    // Moves the files to their place. Nothing is moved when one is there that is not to be
+    // replaced.
+    void Commit();
+
+private:
+    void Check(const std::filesystem::path& file) const;
+
+    std::filesystem::path m_pattern, m_folder, m_temporary;
+    std::vector<std::filesystem::path> m_inputs;
+    bool m_bOverwrite;
+    CInterruptGuard m_guard;
+};
+
+// Whatever the name asks for: a file, numbered files, or standard output, which has no temporary
+// form.
+class COutput {
+public:
+    COutput(const std::filesystem::path& file, bool overwrite,
+            const std::vector<std::filesystem::path>& inputs);
+
+    const std::filesystem::path& Temporary() const;
+    void Commit();
+
+private:
+    std::filesystem::path m_name;
+    std::unique_ptr<COutputFile> m_pFile;
+    std::unique_ptr<COutputSequence> m_pSequence;
 };
 
 } // namespace kyvhost

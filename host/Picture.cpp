@@ -124,8 +124,9 @@ bool IsPictureStart(std::span<const uint8_t> bytes) {
 }
 
 bool IsPictureFile(const fs::path& file) {
-    constexpr size_t kStartBytes = 16;
-    return IsPictureStart(ReadFile(file, kStartBytes)) || IsPictureName(file);
+    const std::vector<uint8_t> start = ReadFile(file, kPictureStartBytes);
+    // A name decides for what no decoder knows, so that the message is about pictures.
+    return IsPictureStart(start) || (IsPictureName(file) && !IsAnimatedPng(start));
 }
 
 Picture DecodePicture(std::span<const uint8_t> bytes, const std::string& name) {

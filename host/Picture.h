@@ -17,6 +17,7 @@ struct Picture {
 };
 
 // Whether the first bytes of a file are those of a picture that DecodePicture knows.
+constexpr size_t kPictureStartBytes = 4096;
 bool IsPictureStart(std::span<const uint8_t> bytes);
 
 // Whether the file's first bytes or, failing that, its name say so. Throws CHostError when there is

@@ -54,11 +54,24 @@ int OrientationOfJpeg(View bytes) {
     return 1;
 }
 
+// A PNG that moves says so before its first pixels, and is a video to us.
+bool IsAnimated(View bytes) {
+    const auto find = [&](std::initializer_list<uint8_t> name) {
+        return std::search(bytes.begin(), bytes.end(), name.begin(), name.end());
+    };
+    const auto control = find({'a', 'c', 'T', 'L'});
+    return control != bytes.end() && control < find({'I', 'D', 'A', 'T'});
+}
+
 } // namespace
+
+bool IsAnimatedPng(View bytes) {
+    return StartsWith(bytes, {0x89, 'P', 'N', 'G'}) && IsAnimated(bytes);
+}
 
 PictureKind KindOf(View bytes) {
     if (StartsWith(bytes, {0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n'})) {
-        return PictureKind::Png;
+        return IsAnimated(bytes) ? PictureKind::None : PictureKind::Png;
     }
     if (StartsWith(bytes, {0xFF, 0xD8, 0xFF})) {
         return PictureKind::Jpeg;

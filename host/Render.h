@@ -10,7 +10,7 @@
 #include "host/Arguments.h"
 #include "host/ClipInstance.h"
 #include "host/Easing.h"
-#include "host/Video.h"
+#include "host/VideoProbe.h"
 
 namespace kyvhost {
 
@@ -35,23 +35,46 @@ struct EffectSettings {
     void Apply(CClipInstance& instance) const;
 };
 
-struct RenderOptions {
+// An effect, its values, and what it takes beside the picture that comes from before it.
+struct StageOptions {
     std::string effect;
     EffectSettings settings;
     std::vector<std::string> animations;
     Easing easing = Easing::Linear;
-    Stereo stereo = Stereo::Mono;
-    std::filesystem::path input, output;
     std::optional<std::filesystem::path> input2;
+};
+
+enum class FieldUse {
+    AsVideo, // frames of two fields are rendered field by field
+    Frames,  // every frame as one picture
+};
+
+// A spot of the input whose colour white is to be.
+struct Pick {
+    uint32_t x = 0, y = 0, radius = 8; // pixels
+};
+
+struct RenderOptions {
+    std::vector<StageOptions> stages; // one at least
+    Stereo stereo = Stereo::Mono;
+    FieldUse fields = FieldUse::AsVideo;
+    std::filesystem::path input, output;
     std::optional<double> time;     // seconds: of a still output
     std::optional<double> start;    // seconds left out of videos
     std::optional<double> duration; // seconds of the clip
+    double offset = 0;              // seconds of the animations that are left out
     std::optional<double> overlap;  // seconds in which two whole clips meet; they play side by
                                     // side from start to end otherwise
     std::optional<Rational> rate;
-    std::optional<VideoCodec> codec;
+    std::optional<Size> size; // of raw frames that come over a pipe
+    std::optional<Pick> pick;
+    std::string codec;                       // empty: the container's usual one
+    std::string outputFormat;                // an ending; empty: that of the name
+    std::vector<std::string> encoderOptions; // for ffmpeg, the last before the output
+    uint32_t jobs = 0;                       // frames at a time; 0: the processor's cores
     VideoTools tools;
     bool overwrite = false;
+    bool strict = false;
     bool quiet = false;
 };
 

@@ -17,6 +17,7 @@ std::filesystem::path ExecutableFile();
 enum class ChildStream {
     Null, // empty when read, swallowed when written
     Pipe, // ours at the other end
+    Own,  // the same as this program's
 };
 
 // A running child. Its three streams may be used from three threads; one stream is for one thread

@@ -1,6 +1,7 @@
 // The command line's surroundings on Linux.
 #include "platform/Console.h"
 
+#include <cerrno>
 #include <csignal>
 #include <thread>
 
@@ -39,6 +40,18 @@ void OnInterrupt(std::function<void()> action) {
         }
         action();
     }).detach();
+}
+
+size_t ReadStandardInput(void* buffer, size_t size) {
+    for (;;) {
+        const ssize_t count = read(STDIN_FILENO, buffer, size);
+        if (count >= 0) {
+            return static_cast<size_t>(count);
+        }
+        if (errno != EINTR) {
+            return 0;
+        }
+    }
 }
 
 void FailAtFileSizeLimit() {

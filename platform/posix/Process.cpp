@@ -73,6 +73,9 @@ public:
     // Connects a standard stream of the child; ours receives our end of a pipe, theirs keeps the
     // child's end open until the start.
     void Connect(ChildStream kind, int stream, CDescriptor& ours, CDescriptor& theirs) {
+        if (kind == ChildStream::Own) {
+            return;
+        }
         if (kind == ChildStream::Null) {
             posix_spawn_file_actions_addopen(&m_actions, stream, "/dev/null",
                                              stream == STDIN_FILENO ? O_RDONLY : O_WRONLY, 0);

@@ -47,6 +47,13 @@ void OnInterrupt(std::function<void()> action) {
     SetConsoleCtrlHandler(HandleControl, TRUE);
 }
 
+size_t ReadStandardInput(void* buffer, size_t size) {
+    DWORD count = 0;
+    const bool read =
+        ReadFile(GetStdHandle(STD_INPUT_HANDLE), buffer, static_cast<DWORD>(size), &count, nullptr);
+    return read ? count : 0;
+}
+
 void FailAtFileSizeLimit() {} // writing fails by itself here
 
 } // namespace kyv

@@ -71,8 +71,18 @@ struct Stream {
 };
 
 // The child's end is inheritable, ours is not.
-void Connect(ChildStream kind, bool isInput, Stream& ours, CHandle& theirs) {
+void Connect(ChildStream kind, DWORD standard, Stream& ours, CHandle& theirs) {
+    const bool isInput = standard == STD_INPUT_HANDLE;
     SECURITY_ATTRIBUTES inherit = {sizeof inherit, nullptr, TRUE};
+    if (kind == ChildStream::Own) {
+        HANDLE same = nullptr;
+        if (!DuplicateHandle(GetCurrentProcess(), GetStdHandle(standard), GetCurrentProcess(),
+                             &same, 0, TRUE, DUPLICATE_SAME_ACCESS)) {
+            Fail("standard stream");
+        }
+        theirs = CHandle(same);
+        return;
+    }
     std::wstring name = L"NUL";
     if (kind == ChildStream::Pipe) {
         static std::atomic<uint32_t> pipes;
@@ -141,9 +151,9 @@ CProcess::CProcess(const std::string& program, const std::vector<std::string>& a
     const std::lock_guard lock(starting);
 
     CHandle childInput, childOutput, childError;
-    Connect(input, true, m_pState->input, childInput);
-    Connect(output, false, m_pState->output, childOutput);
-    Connect(error, false, m_pState->error, childError);
+    Connect(input, STD_INPUT_HANDLE, m_pState->input, childInput);
+    Connect(output, STD_OUTPUT_HANDLE, m_pState->output, childOutput);
+    Connect(error, STD_ERROR_HANDLE, m_pState->error, childError);
 
     STARTUPINFOW startup = {};
     startup.cb = sizeof startup;

@@ -73,6 +73,22 @@ TEST_F(RenderTest, PixelsOfTheWhiteBalance) {
     EXPECT_THAT(Files(), ElementsAre("in.png", "out.png"));
 }
 
+TEST_F(RenderTest, WhiteIsPickedFromThePicture) {
+    // Two colours about (10, 10): within a radius of 1 five pixels, of which the middle row's three
+    // are 0xFF8040 and the others 0xA08040. Mean red (3 * 255 + 2 * 160) / 5 = 217.
+    std::vector<uint32_t> pixels(20 * 20, 0xFFA08040);
+    std::fill_n(pixels.begin() + 10 * 20, 20, 0xFFFF8040);
+    Write("in.png", 20, pixels);
+    const HostResult picked =
+        RunHost({"render", "11", Path("in.png"), Path("a.png"), "--pick", "10,10,1"});
+    EXPECT_EQ(picked.status, 0);
+    EXPECT_EQ(picked.error, "kyvhost: note: picked #D98040\n");
+    EXPECT_EQ(
+        RunHost({"render", "11", Path("in.png"), Path("b.png"), "--set", "P1=#D98040"}).status, 0);
+    EXPECT_EQ(Read("a.png"), Read("b.png"));
+    EXPECT_NE(Read("a.png"), pixels);
+}
+
 TEST_F(RenderTest, EffectsAreFoundByEveryName) {
     Write("in.png", 1, {0xFF646464});
     for (const char* name :
@@ -300,7 +316,11 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
         {{"render", "9", in, out, "--animate", "P5=0:1"}, 2, {"choice", "--set"}},
         {{"render", "6", in, out}, 2, {"two inputs", "--input2"}},
         {{"render", "11", in, out, "--input2", in}, 2, {"one input"}},
-        {{"render", "11", in, Path("out.gif")}, 2, {"out.gif", ".png", ".mp4"}},
+        {{"render", "11", in, Path("out.xyz")}, 2, {"out.xyz", ".png", ".mp4"}},
+        {{"render", "11", in, Path("out.mp4"), "--output-format", "doc"}, 2, {"\"doc\"", ".nut"}},
+        {{"render", "11", in, out, "--pick", "3,0"}, 2, {"3,0 is out of range", "3 x 2 pixels"}},
+        {{"render", "11", in, out, "--pick", "1"}, 2, {"--pick", "640,360"}},
+        {{"render", "bubble", in, out, "--pick", "1,1"}, 2, {"bubble has no colour"}},
         {{"render", "11", in, Path("none/out.png")}, 1, {"none", "does not exist"}},
         {{"render", "11", in, out, "--time", "11"},
          2,

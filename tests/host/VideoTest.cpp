@@ -5,7 +5,7 @@
 
 #include <gmock/gmock.h>
 
-#include "host/Video.h"
+#include "host/VideoReader.h"
 #include "tests/host/HostRun.h"
 
 namespace kyvtest {
@@ -59,12 +59,13 @@ protected:
     // All frames, as words.
     std::vector<std::vector<uint32_t>> Frames(const std::string& name) {
         const kyvhost::VideoTools tools;
-        const kyvhost::VideoInfo info = kyvhost::ProbeVideo(tools, Path(name));
-        kyvhost::CVideoReader reader(tools, Path(name), info, info.width, info.height, info.rate,
-                                     0);
+        const kyvhost::MediaInput input = kyvhost::OpenMedia(Path(name), {});
+        const kyvhost::VideoInfo info = kyvhost::ProbeVideo(tools, input);
+        kyvhost::CVideoReader reader(tools, input, info, {info.width, info.height, 0, {}});
         std::vector<std::vector<uint32_t>> frames;
         std::vector<uint32_t> frame(size_t{info.width} * info.height);
-        while (reader.Read(reinterpret_cast<uint8_t*>(frame.data()))) {
+        double seconds = 0;
+        while (reader.Read(reinterpret_cast<uint8_t*>(frame.data()), seconds)) {
             frames.push_back(frame);
         }
         return frames;
@@ -216,7 +217,14 @@ TEST_F(VideoTest, ErrorsLeaveNothing) {
         {{"in.mkv", out, "--ffmpeg", "/none/ffmpeg"}, 2, "--ffmpeg: \"/none/ffmpeg\""},
 #endif
         {{"in.mkv", out, "--overlap", "1"}, 2, "and probe takes one input"},
-        {{"in.mkv", Path("out.mp4"), "--codec", "ffv1"}, 2, ".mkv"},
+        {{"in.mkv", Path("out.mp4"), "--codec", "ffv1"}, 2, "FFV1 does not go into .mp4"},
+        {{"in.mkv", Path("out.mov"), "--codec", "nosuch"}, 2, "\"nosuch\" is not one of h264"},
+        {{"in.mkv", Path("out.mp4"), "--strict"}, 1, "--strict: the sound becomes AAC"},
+        {{"in.mkv", out, "--duration", "9", "--strict"}, 1, "9 s is more than there is"},
+        {{"in.mkv", out, "--size", "6x6"}, 2, "--size is for raw frames"},
+        {{"in.mkv", out, "--encoder-options", "-crf '1"}, 2, "a quote has no end"},
+        {{"in.mkv", Path("none/%03d.png")}, 1, "none does not exist"},
+        {{"none%03d.png", out}, 3, "no file has a name of this form"},
         {{"in.mkv", out, "--start", "1m"}, 2, "\"1m\""},
         {{"in.mkv", out, "--start", "1"}, 2, "lasts 0.3"},
         {{"in.mkv", out, "--time", "0"}, 2, "--start"},
