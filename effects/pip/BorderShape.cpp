@@ -23,8 +23,8 @@ RasterPointF UnitNormal(RasterPoint from, RasterPoint to) {
 }
 
 RasterPoint Offset(RasterPoint point, RasterPointF normal, float by) {
-    return Truncate(
-        {static_cast<float>(point.x) + normal.x * by, static_cast<float>(point.y) + normal.y * by});
+    return Truncate(RasterPointF{static_cast<float>(point.x) + normal.x * by,
+                                 static_cast<float>(point.y) + normal.y * by});
 }
 
 // The normal of the nearest side that has length, from one side on forwards (step 1) or backwards
@@ -38,11 +38,25 @@ const RasterPointF& JoinedNormal(const RasterPointF (&normals)[4], int side, int
 
 } // namespace
 
-void AddBorderShape(CSpanRows& spans, const RasterWindow& window, const RasterPoint (&quad)[4],
-                    int32_t size) {
-    const CWindowWalk walk(window);
+PixelBox BorderShape::Box() const {
+    constexpr int32_t kFarthest = 99999;
+    PixelBox box = {};
+    for (const RasterPoint& corner : corners) {
+        const int32_t x = std::min(corner.x, kFarthest);
+        const int32_t y = std::min(corner.y, kFarthest);
+        box = box.About({x, y, x + 1, y + 1});
+    }
+    return box;
+}
+
+void AddBorderShape(CSpanRows& spans, const BorderShape& shape) {
+    if (shape.size < 0) {
+        return;
+    }
+    const CWindowWalk walk({0, 0, shape.width, shape.height});
     const auto add = [&](int32_t y, int32_t first, int32_t last) { spans.Add(y, first, last); };
-    const int32_t wholeHalf = size / 2;
+    const auto& quad = shape.corners;
+    const int32_t wholeHalf = shape.size / 2;
     const auto half = static_cast<float>(wholeHalf);
     RasterPointF normals[4];
     for (int i = 0; i < 4; ++i) {

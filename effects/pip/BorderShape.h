@@ -1,6 +1,7 @@
 // The shape of a quad's border.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 
 #include "effects/pip/Rasterizer.h"
@@ -8,9 +9,19 @@
 
 namespace kyv {
 
-// Adds the border of a quad with corners A, B, C, D, as far as it is in the window: a band of
-// `size` pixels about every side, wedges on the outer side of every corner and discs that round it.
-void AddBorderShape(CSpanRows& spans, const RasterWindow& window, const RasterPoint (&quad)[4],
-                    int32_t size);
+struct BorderShape {
+    int32_t width, height; // of the frame
+    RasterPoint corners[4];
+    int32_t size; // pixels; below 0 for no border
+
+    // About the corners; no coordinate of one counts beyond 99999.
+    PixelBox Box() const;
+    PixelBox WidenedBox() const { return Box().Grown(std::max(size, 0)); }
+    bool operator==(const BorderShape&) const = default;
+};
+
+// Adds the border as far as it is in the frame: a band of `size` pixels about every side, wedges on
+// the outer side of every corner and discs that round it.
+void AddBorderShape(CSpanRows& spans, const BorderShape& shape);
 
 } // namespace kyv

@@ -2,24 +2,23 @@
 #pragma once
 
 #include <cstdint>
-#include <vector>
 
 #include "effects/pip/SpanRows.h"
 
 namespace kyv {
 
-// One bit a pixel. Nobody has to know what coverage depends on: it is taken from the picture
-// itself, and compared.
+// Nobody has to know what coverage depends on: it is taken from the picture itself, and compared.
 class CCoverage {
 public:
-    // A frame's rows follow. Outside the box nothing is covered.
-    void Begin(int32_t width, int32_t height, const PixelBox& box);
+    // The rows of a frame of this height follow. Outside the box nothing is covered.
+    void Begin(int32_t height, const PixelBox& box);
 
     // Row y of the box, top to bottom; pixels is the frame's row, of which alpha is looked at.
     void Take(int32_t y, const uint8_t* pixels);
 
     // The covered columns of a row; none outside the frame.
-    void GetRuns(int32_t y, Runs& runs) const;
+    std::span<const Run> Row(int32_t y) const { return m_rows.Row(y); }
+    const PixelBox& Box() const { return m_box; }
 
     // Another number whenever anything has changed.
     uint64_t Serial() const { return m_serial; }
@@ -27,13 +26,10 @@ public:
     int32_t LastChanged() const { return m_lastChanged; }
 
 private:
-    size_t WordsPerRow() const { return m_scratch.size(); }
-
-    int32_t m_width = 0;
     int32_t m_height = 0;
     PixelBox m_box = {};
-    std::vector<uint64_t> m_words;
-    std::vector<uint64_t> m_scratch;
+    CSpanRows m_rows;
+    Runs m_taken;
     uint64_t m_serial = 0;
     int32_t m_lastChanged = -1;
 };

@@ -5,28 +5,14 @@
 #include <cstring>
 #include <optional>
 
-#include "effects/pip/BorderShape.h"
-#include "effects/pip/Coverage.h"
 #include "effects/pip/FreeformPiP.h"
-#include "effects/pip/PictureRows.h"
-#include "effects/pip/PipLayer.h"
+#include "effects/pip/PictureLayer.h"
+#include "effects/pip/ShapeLayer.h"
 #include "imageutility/Conversion.h"
 #include "interface/FrameGeometry.h"
 #include "interface/ParamReader.h"
 
 namespace kyv {
-
-// What is kept from frame to frame. Each stage notes what its result was made from and compares it
-// with what the next frame wants.
-class CPipWork {
-public:
-    CPictureRows picture;
-    CCoverage coverage;
-    CSpanRows borderSpans;
-    std::optional<BorderShape> borderShape; // of the spans
-    CPipLayer border;
-    CPipLayer shadow;
-};
 
 namespace {
 
@@ -36,30 +22,26 @@ using KYVImageUtility::CImageARGB;
 constexpr float ReferenceWidth = 320.0F;
 constexpr float ReferenceHeight = 240.0F;
 
-// The bounding box takes no coordinate beyond this.
-constexpr int32_t kFarthestInBox = 99999;
-
 static_assert(kWideMapOption == CpuLevelOption_WideMap);
 
 struct LayerSettings {
     bool enabled;
     uint8_t alpha;
-    int32_t blur; // pixels
-    LayerColor first, second;
-    int32_t direction;
+    LayerStyle style; // of the picture the blur alone
 };
 
 struct Settings {
     RasterPoint corners[4];
     PictureKey key;
-    LayerSettings picture; // without colours
+    LayerSettings picture;
     LayerSettings shadow;
     int32_t shadowX, shadowY;
     LayerSettings border;
     int32_t borderSize;
+    bool ayuv;
     bool wideMap; // for pictures beyond 1024 columns or rows
 
-    bool DrawsAnything() const { return picture.enabled || shadow.enabled || border.enabled; }
+    bool HasLayers() const { return border.enabled || shadow.enabled; }
 };
 
 int32_t ToPixels(float part, int32_t length) {
@@ -84,57 +66,44 @@ LayerColor ToLayerColor(uint32_t color, bool ayuv) {
     return {{static_cast<uint8_t>(b), static_cast<uint8_t>(g), static_cast<uint8_t>(r)}};
 }
 
-Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometry, bool ayuv) {
+Settings ReadSettings(const EffectContext& context, const FrameGeometry& geometry) {
     using Param = Freeform::Param;
     const CParamReader<Param> params(context);
     const float scaleX = static_cast<float>(geometry.width) / ReferenceWidth;
     const float scaleY = static_cast<float>(geometry.height) / ReferenceHeight;
-    const float scaleBlur = (scaleX + scaleY) / 2.0F;
+    // Less than half of the frame, as a window of the blur is.
+    const int32_t longestBlur = (std::min(geometry.width, geometry.height) - 1) / 2;
     Settings s = {};
-    const auto corner = [&](Param x, Param y) -> RasterPoint {
-        return {ToPixels(params.Float(x), geometry.width),
-                ToPixels(params.Float(y), geometry.height)};
+    s.ayuv = context.pixelFormat == PixelFormat_Ayuv;
+    s.wideMap = HasWideMapOption(context.cpuLevel);
+    const auto layer = [&](Param enable, Param alpha, Param blur) -> LayerSettings {
+        return {.enabled = params.Int(enable) != 0,
+                .alpha = params.Byte(alpha),
+                .style = {.blur = std::min(Scale(params.Int(blur), (scaleX + scaleY) / 2.0F),
+                                           longestBlur)}};
     };
-    s.corners[0] = corner(Param::PointAX, Param::PointAY);
-    s.corners[1] = corner(Param::PointBX, Param::PointBY);
-    s.corners[2] = corner(Param::PointCX, Param::PointCY);
-    s.corners[3] = corner(Param::PointDX, Param::PointDY);
+    const auto color = [&](Param param) { return ToLayerColor(params.Color(param), s.ayuv); };
+    for (uint32_t i = 0; i < 4; ++i) {
+        s.corners[i] = {ToPixels(params.Float(Param{Param::PointAX + 2 * i}), geometry.width),
+                        ToPixels(params.Float(Param{Param::PointAY + 2 * i}), geometry.height)};
+    }
     const uint32_t key = params.Color(Param::KeyColor);
     s.key = {params.Int(Param::KeyEnable) != 0,
              (key & 255) << 16 | (key & 0xFF00) | (key >> 16 & 255),
              params.Byte(Param::KeyTolerance)};
-    s.picture.enabled = params.Int(Param::PictureEnable) != 0;
-    s.picture.alpha = params.Byte(Param::PictureAlpha);
-    s.picture.blur = Scale(params.Int(Param::PictureBlur), scaleBlur);
-    s.shadow.enabled = params.Int(Param::ShadowEnable) != 0;
-    s.shadow.first = ToLayerColor(params.Color(Param::ShadowColor1), ayuv);
-    s.shadow.second = ToLayerColor(params.Color(Param::ShadowColor2), ayuv);
-    s.shadow.direction = params.Int(Param::ShadowType);
-    s.shadow.alpha = params.Byte(Param::ShadowAlpha);
-    s.shadow.blur = Scale(params.Int(Param::ShadowBlur), scaleBlur);
+    s.picture = layer(Param::PictureEnable, Param::PictureAlpha, Param::PictureBlur);
+    s.shadow = layer(Param::ShadowEnable, Param::ShadowAlpha, Param::ShadowBlur);
+    s.shadow.style.first = color(Param::ShadowColor1);
+    s.shadow.style.second = color(Param::ShadowColor2);
+    s.shadow.style.direction = params.Int(Param::ShadowType);
     s.shadowX = ToPixels(params.Float(Param::ShadowOffsetX), geometry.width);
     s.shadowY = ToPixels(params.Float(Param::ShadowOffsetY), geometry.height);
-    s.border.enabled = params.Int(Param::BorderEnable) != 0;
-    s.borderSize = s.border.enabled ? Scale(params.Int(Param::BorderSize), scaleX) : 0;
-    s.border.first = ToLayerColor(params.Color(Param::BorderColor1), ayuv);
-    s.border.second = ToLayerColor(params.Color(Param::BorderColor2), ayuv);
-    s.border.direction = params.Int(Param::BorderType);
-    s.border.alpha = params.Byte(Param::BorderAlpha);
-    s.border.blur = Scale(params.Int(Param::BorderBlur), scaleBlur);
-    s.wideMap = HasWideMapOption(context.cpuLevel);
+    s.border = layer(Param::BorderEnable, Param::BorderAlpha, Param::BorderBlur);
+    s.border.style.first = color(Param::BorderColor1);
+    s.border.style.second = color(Param::BorderColor2);
+    s.border.style.direction = params.Int(Param::BorderType);
+    s.borderSize = s.border.enabled ? Scale(params.Int(Param::BorderSize), scaleX) : -1;
     return s;
-}
-
-// The corners' bounding box.
-PixelBox BoundCorners(const RasterPoint (&corners)[4]) {
-    PixelBox box = {kFarthestInBox, kFarthestInBox, -kFarthestPoint, -kFarthestPoint};
-    for (const RasterPoint& corner : corners) {
-        const int32_t x = std::min(corner.x, kFarthestInBox);
-        const int32_t y = std::min(corner.y, kFarthestInBox);
-        box = {std::min(box.left, x), std::min(box.top, y), std::max(box.right, x),
-               std::max(box.bottom, y)};
-    }
-    return {box.left, box.top, box.right + 1, box.bottom + 1};
 }
 
 // Copies a row of the background; null for one of a field that the call does not treat.
@@ -150,153 +119,122 @@ uint8_t* CopyRow(uint32_t field, const CImageARGB& background, const CImageARGB&
     return row;
 }
 
-// One frame: a single pass over its rows. Every stage makes the rows of its result in order and
-// asks the stages before it for as many as it looks at:
+} // namespace
+
+// One frame: a single pass over its rows. Every layer makes its rows in order and asks those before
+// it for as many as it looks at:
 //
 //   picture    foreground, through the map and the key; coverage is taken from it
 //   border     the quad's shape less the coverage
 //   shadow     coverage and shape, moved
 //   output     background, and over it shadow, border and picture, each blurred on the way
 //
-// What comes out is the same as if every stage went over the whole frame before the next, but for
+// What comes out is the same as if every layer went over the whole frame before the next, but for
 // a picture whose box lies outside the frame: it is left out, although its quad marks the edge.
-class CFrameWork {
+//
+// What is kept from frame to frame is compared with what it was made from.
+class CPipWork {
 public:
-    CFrameWork(const Settings& settings, CFreeformPiP& pip, CPipWork& work, bool ayuv)
-        : m_settings(settings), m_pip(pip), m_work(work), m_ayuv(ayuv),
-          m_quadBox(BoundCorners(settings.corners)) {}
-
     // The output may be the frame of either input. Rows of a field that the call does not treat
     // are left as they are.
-    void Render(uint32_t field, const CImageARGB& foreground, const CImageARGB& background,
+    void Render(const Settings& settings, CFreeformPiP& pip, uint32_t field,
+                const CImageARGB& foreground, const CImageARGB& background,
                 const CImageARGB& output) {
-        Begin(foreground, foreground.GetBuffer() == output.GetBuffer());
+        const int32_t lead =
+            Begin(settings, pip, foreground, foreground.GetBuffer() == output.GetBuffer());
         for (int32_t y = 0; y < output.GetHeight(); ++y) {
-            if (HasLayers() || m_lead > 0) {
-                m_work.picture.MakeTo(y + m_lead);
-            }
+            m_picture.MakeTo(y + lead);
             uint8_t* row = CopyRow(field, background, output, y);
-            if (m_settings.shadow.enabled) {
-                m_work.shadow.Blend(y, row, m_settings.shadow.alpha);
+            if (settings.shadow.enabled) {
+                m_shadow.Blend(y, row, settings.shadow.alpha);
             }
-            if (m_settings.border.enabled) {
-                m_work.border.Blend(y, row, m_settings.border.alpha);
+            if (settings.border.enabled) {
+                m_border.Blend(y, row, settings.border.alpha);
             }
-            if (m_settings.picture.enabled) {
-                m_work.picture.Blend(y, row, m_settings.picture.alpha);
+            if (settings.picture.enabled) {
+                m_picture.Blend(y, row, settings.picture.alpha);
             }
         }
-        End();
+        pip.EndRows();
+        if (settings.shadow.enabled) {
+            m_shadow.End();
+        }
+        if (settings.border.enabled) {
+            m_border.End();
+        }
     }
 
 private:
-    bool HasLayers() const { return m_settings.border.enabled || m_settings.shadow.enabled; }
-
-    void Begin(const CImageARGB& foreground, bool isOverwritten) {
+    // How many rows ahead of the output the picture is made.
+    int32_t Begin(const Settings& settings, CFreeformPiP& pip, const CImageARGB& foreground,
+                  bool isOverwritten) {
         const int32_t width = foreground.GetWidth();
         const int32_t height = foreground.GetHeight();
         const RasterPoint source[4] = {{0, 0}, {width, 0}, {width, height}, {0, height}};
-        m_pip.SetSize(width, height, width, height);
-        m_pip.SetWide(m_settings.wideMap);
-        m_pip.SetSourcePoints(source, 4);
-        m_pip.SetDestPoints(m_settings.corners, 4);
+        pip.SetSize(width, height, width, height);
+        pip.SetWide(settings.wideMap);
+        pip.SetSourcePoints(source, 4);
+        pip.SetDestPoints(settings.corners, 4);
 
-        const int32_t longestBlur = (std::min(width, height) - 1) / 2;
-        const auto blur = [&](const LayerSettings& layer) {
-            return layer.enabled ? std::min(layer.blur, longestBlur) : 0;
-        };
-        m_lead = 0;
-        if (m_settings.border.enabled) {
-            m_lead = std::max(m_lead, blur(m_settings.border));
+        BorderShape shape = {width, height, {}, settings.borderSize};
+        std::copy(settings.corners, settings.corners + 4, shape.corners);
+        int32_t lead = 0;
+        if (settings.border.enabled) {
+            lead = std::max(lead, settings.border.style.blur);
         }
-        if (m_settings.shadow.enabled) {
-            m_lead = std::max(m_lead, blur(m_settings.shadow) - m_settings.shadowY);
+        if (settings.shadow.enabled) {
+            lead = std::max(lead, settings.shadow.style.blur - settings.shadowY);
         }
-        m_lead = isOverwritten ? height : std::min(m_lead, height);
-        m_work.picture.Begin(m_pip, foreground,
-                             {.key = m_settings.key,
-                              .blur = blur(m_settings.picture),
-                              .ayuv = m_ayuv,
-                              .box = m_quadBox,
-                              .lead = std::max(m_lead, blur(m_settings.picture)),
-                              .coverage = HasLayers() ? &m_work.coverage : nullptr});
-        if (!HasLayers()) {
-            return;
+        lead = isOverwritten ? height : std::min(lead, height);
+        const int32_t blur = settings.picture.enabled ? settings.picture.style.blur : 0;
+        m_picture.Begin(pip, foreground,
+                        {.key = settings.key,
+                         .blur = blur,
+                         .ayuv = settings.ayuv,
+                         .box = shape.Box(),
+                         .lead = std::max(lead, blur),
+                         .coverage = settings.HasLayers() ? &m_coverage : nullptr});
+        if (!settings.HasLayers()) {
+            return lead;
         }
-        m_work.coverage.Begin(width, height, m_work.picture.Box());
-        BorderShape shape = {
-            width, height, {}, m_settings.border.enabled ? m_settings.borderSize : -1};
-        std::copy(m_settings.corners, m_settings.corners + 4, shape.corners);
-        LayerRecipe recipe = {.shape = shape,
-                              .box = DrawShape(shape)
-                                         .About(m_work.picture.Box())
-                                         .CutTo(m_quadBox.Grown(m_settings.borderSize)),
-                              .ayuv = m_ayuv,
-                              .takesBorder = m_settings.border.enabled,
-                              .gradientBox = GradientBox()};
-        const auto begin = [&](CPipLayer& layer, const LayerSettings& settings) {
-            recipe.first = settings.first;
-            recipe.second = settings.second;
-            recipe.direction = settings.direction;
-            recipe.blur = blur(settings);
-            layer.Begin(recipe, m_pip.Spans(), m_work.borderSpans, m_work.coverage,
-                        foreground.GetInstructionSet());
-        };
-        if (m_settings.border.enabled) {
-            recipe.cutsPicture = true;
-            begin(m_work.border, m_settings.border);
+        m_coverage.Begin(height, m_picture.Content());
+        if (m_borderShape != shape) {
+            m_borderShape.reset();
+            m_borderSpans.Begin(height);
+            AddBorderShape(m_borderSpans, shape);
+            m_borderShape = shape;
         }
-        if (m_settings.shadow.enabled) {
-            recipe.cutsPicture = false;
-            recipe.takesPicture = m_settings.picture.enabled;
-            recipe.dx = m_settings.shadowX;
-            recipe.dy = m_settings.shadowY;
-            recipe.gradientBox = recipe.gradientBox.Moved(recipe.dx, recipe.dy);
-            begin(m_work.shadow, m_settings.shadow);
+        const InstructionSet set = foreground.GetInstructionSet();
+        if (settings.border.enabled) {
+            m_border.Begin({.shape = shape,
+                            .ayuv = settings.ayuv,
+                            .style = settings.border.style,
+                            .takesBorder = true,
+                            .cutsPicture = true},
+                           pip.Spans(), m_borderSpans, m_coverage, set);
         }
+        if (settings.shadow.enabled) {
+            m_shadow.Begin({.shape = shape,
+                            .ayuv = settings.ayuv,
+                            .style = settings.shadow.style,
+                            .takesPicture = settings.picture.enabled,
+                            .takesBorder = settings.border.enabled,
+                            .dx = settings.shadowX,
+                            .dy = settings.shadowY},
+                           pip.Spans(), m_borderSpans, m_coverage, set);
+        }
+        return lead;
     }
 
-    void End() {
-        m_work.picture.End();
-        if (m_settings.border.enabled) {
-            m_work.border.End();
-        }
-        if (m_settings.shadow.enabled) {
-            m_work.shadow.End();
-        }
-    }
-
-    // Its bounds.
-    PixelBox DrawShape(const BorderShape& shape) {
-        if (m_work.borderShape != shape) {
-            m_work.borderShape.reset();
-            m_work.borderSpans.Begin(shape.height);
-            const PixelBox box =
-                m_quadBox.Grown(shape.size).CutTo({0, 0, shape.width, shape.height});
-            if (shape.size >= 0 && !box.IsEmpty()) {
-                AddBorderShape(m_work.borderSpans,
-                               {box.left, box.top, box.right - 1, box.bottom - 1}, shape.corners,
-                               shape.size);
-            }
-            m_work.borderSpans.Finish();
-            m_work.borderShape = shape;
-        }
-        return m_work.borderSpans.Bounds();
-    }
-
-    // The corners' box widened by the border; its right and bottom are inside.
-    PixelBox GradientBox() const {
-        return PixelBox{m_quadBox.left, m_quadBox.top, m_quadBox.right - 1, m_quadBox.bottom - 1}
-            .Grown(m_settings.borderSize);
-    }
-
-    const Settings& m_settings;
-    CFreeformPiP& m_pip;
-    CPipWork& m_work;
-    bool m_ayuv;
-    PixelBox m_quadBox;
-    int32_t m_lead = 0; // how many rows ahead of the output the picture is made
+    CPictureLayer m_picture;
+    CCoverage m_coverage;
+    CSpanRows m_borderSpans;
+    std::optional<BorderShape> m_borderShape; // of the spans
+    CShapeLayer m_border;
+    CShapeLayer m_shadow;
 };
+
+namespace {
 
 void Prepare(Freeform::Instance& instance) {
     if (!instance.pip) {
@@ -320,17 +258,16 @@ KyvStatus Freeform::Process(EffectContext& context, Instance& instance) {
     }
     const CImageARGB output = ViewOf(geometry, context.frame);
     const CImageARGB background = ViewOf(geometry, instance.background);
-    const bool ayuv = context.pixelFormat == PixelFormat_Ayuv;
-    const Settings settings = ReadSettings(context, geometry, ayuv);
-    if (!instance.foreground || !settings.DrawsAnything()) {
+    const Settings settings = ReadSettings(context, geometry);
+    if (!instance.foreground || (!settings.picture.enabled && !settings.HasLayers())) {
         for (int32_t y = 0; y < geometry.height; ++y) {
             CopyRow(context.fieldSelector, background, output, y);
         }
         return KYV_OK;
     }
     Prepare(instance);
-    CFrameWork work(settings, *instance.pip, *instance.work, ayuv);
-    work.Render(context.fieldSelector, ViewOf(geometry, instance.foreground), background, output);
+    instance.work->Render(settings, *instance.pip, context.fieldSelector,
+                          ViewOf(geometry, instance.foreground), background, output);
     return KYV_OK;
 }
 

@@ -2,7 +2,6 @@
 #include "effects/pip/FreeformPiP.h"
 
 #include <algorithm>
-#include <atomic>
 
 #include "effects/pip/QuadRenderers.h"
 #include "effects/pip/SpanWalk.h"
@@ -12,11 +11,8 @@ namespace {
 
 using KYVImageUtility::CImageARGB;
 
-// Written under CRasterLock, so that nobody becomes current while another object draws through the
-// callback.
-std::atomic<CFreeformPiP*> g_current = nullptr;
-
 constexpr int32_t kTileSize = 1024; // columns and rows that entries address
+constexpr uint32_t kTileBits = 0x03FF03FF;
 
 void ToFloat(const RasterPoint (&points)[4], RasterPointF (&floats)[4]) {
     std::transform(points, points + 4, floats, [](RasterPoint p) {
@@ -26,61 +22,38 @@ void ToFloat(const RasterPoint (&points)[4], RasterPointF (&floats)[4]) {
 
 } // namespace
 
-CFreeformPiP::CFreeformPiP() : m_pFilter(SelectResampleFilter(4, nullptr)) {
-    const CRasterLock lock;
-    g_current = this;
-}
-
-CFreeformPiP::~CFreeformPiP() {
-    const CRasterLock lock;
-    if (g_current == this) {
-        g_current = nullptr;
-    }
-}
-
-CFreeformPiP* CFreeformPiP::Current() {
-    return g_current;
-}
+CFreeformPiP::CFreeformPiP() : m_pFilter(SelectResampleFilter(4, nullptr)) {}
 
 void CFreeformPiP::SetSize(int32_t sourceWidth, int32_t sourceHeight, int32_t destWidth,
                            int32_t destHeight) {
-    if (sourceWidth != m_nSourceWidth || sourceHeight != m_nSourceHeight ||
-        destWidth != m_nDestWidth || destHeight != m_nDestHeight) {
-        m_bDirty = true;
-    }
+    m_bDirty = m_bDirty || sourceWidth != m_nSourceWidth || sourceHeight != m_nSourceHeight ||
+               destWidth != m_nDestWidth || destHeight != m_nDestHeight;
     m_nSourceWidth = sourceWidth;
     m_nSourceHeight = sourceHeight;
     m_nDestWidth = destWidth;
     m_nDestHeight = destHeight;
-    m_bSizeSet = sourceWidth > 0 && sourceHeight > 0 && destWidth > 0 && destHeight > 0;
 }
 
-// True when a point has changed.
-bool CFreeformPiP::StorePoints(const RasterPoint* points, int32_t count, RasterPoint (&stored)[4]) {
-    bool changed = false;
+int32_t CFreeformPiP::StorePoints(const RasterPoint* points, int32_t count,
+                                  RasterPoint (&stored)[4]) {
+    if (!points || count < 0 || count > kPointLimit) {
+        return 0;
+    }
     for (int32_t i = 0; i < count; ++i) {
         const RasterPoint point = {std::clamp(points[i].x, -kFarthestPoint, kFarthestPoint),
                                    std::clamp(points[i].y, -kFarthestPoint, kFarthestPoint)};
-        changed = changed || point.x != stored[i].x || point.y != stored[i].y;
+        m_bDirty = m_bDirty || point != stored[i];
         stored[i] = point;
     }
-    return changed;
+    return 1;
 }
 
 int32_t CFreeformPiP::SetSourcePoints(const RasterPoint* points, int32_t count) {
-    if (!points || count < 0 || count > kPointLimit) {
-        return 0;
-    }
-    m_bDirty = StorePoints(points, count, m_sourcePoints) || m_bDirty;
-    return 1;
+    return StorePoints(points, count, m_sourcePoints);
 }
 
 int32_t CFreeformPiP::SetDestPoints(const RasterPoint* points, int32_t count) {
-    if (!points || count < 0 || count > kPointLimit) {
-        return 0;
-    }
-    m_bDirty = StorePoints(points, count, m_destPoints) || m_bDirty;
-    return 1;
+    return StorePoints(points, count, m_destPoints);
 }
 
 void CFreeformPiP::SetQuadModel(int32_t model) {
@@ -98,208 +71,63 @@ void CFreeformPiP::SetFilterIndex(int32_t index) {
     m_bDirty = true;
 }
 
-// False without a size or when the source, unless it is null for none, has no pixels or another
-// size.
-bool CFreeformPiP::Prepare(const CImageARGB* source, InstructionSet set) {
-    if (!m_bSizeSet || (source && (!source->GetBuffer() || source->GetWidth() != m_nSourceWidth ||
-                                   source->GetHeight() != m_nSourceHeight))) {
-        return false;
-    }
-    m_renderer = source ? Renderer::Picture : Renderer::Checkerboard;
-    m_picture = {};
-    if (source) {
-        m_picture = {source->GetBuffer(), source->GetPitch(), m_nSourceWidth, m_nSourceHeight};
-    }
-    m_pMapRow = kQuadMapRow.For(set);
-    m_pSampleRow = kQuadSampleRow.For(set);
-    if (m_bDirty) {
-        Allocate();
-        RasterPointF quad[4], corners[4];
-        ToFloat(m_destPoints, quad);
-        ToFloat(m_sourcePoints, corners);
-        m_model.Set(quad, corners);
-        m_spans.Begin(m_nDestHeight);
-        CWindowWalk({0, 0, m_nDestWidth - 1, m_nDestHeight - 1})
-            .ClampQuad(m_destPoints, [&](int32_t y, int32_t first, int32_t last) {
-                m_spans.Add(y, first, last);
-            });
-        m_spans.Finish();
-        m_tiles.clear();
-        m_tileStarts.resize(static_cast<size_t>(m_nDestHeight));
-    }
-    return true;
-}
-
 void CFreeformPiP::SetWide(bool wide) {
     m_bDirty = m_bDirty || wide != m_bWide;
     m_bWide = wide;
 }
 
-bool CFreeformPiP::IsWide() const {
-    return m_bWide && (m_nSourceWidth > kTileSize || m_nSourceHeight > kTileSize) &&
-           (m_nMapMode == MapMode_Nearest || m_nMapMode == MapMode_Bilinear);
-}
-
-// The operations are those of the map with the picture at 1/1024 of its size, which a double holds
-// as exactly, so that tile and entry fit together to the last bit.
-uint32_t CFreeformPiP::TileOf(int32_t x, int32_t y) const {
-    constexpr double kPart = 1.0 / kTileSize;
-    uint32_t entry = 0;
-    if (m_nQuadModel == QuadModel_InverseBilinear) {
-        QuadMapRowPlan plan = m_model.PlanRow(y);
-        plan.originU *= kPart;
-        plan.originV *= kPart;
-        plan.rangeU *= kPart;
-        plan.rangeV *= kPart;
-        entry = MapEntry(plan, x);
-    } else if (const QuadPoint point = m_model.WachspressPoint(x, y); point.inside) {
-        entry = MapEntry(point.u * kPart, point.v * kPart);
-    }
-    return entry >> 6 & 0x03FF03FF;
-}
-
-// Of a block that begins and ends in one tile all pixels are in it when their entries lie between
-// those at its ends, or a few pixels of the picture beyond: such a pixel in another tile would be
-// nearly 1024 away. Of other blocks every pixel is asked.
-void CFreeformPiP::BuildTiles(const Run& run, int32_t y) {
-    constexpr int32_t kBlock = 32;
-    constexpr uint32_t kSlack = 4 * 64; // of entries
-    constexpr uint32_t kHighest = 0xFFFF - kSlack;
-    const uint32_t* map =
-        m_pSourceMap.get() + static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth);
-    const size_t rowStart = m_tiles.size();
-    const auto add = [&](int32_t end, uint32_t tile) {
-        if (m_tiles.size() > rowStart && m_tiles.back().tile == tile) {
-            m_tiles.back().end = end;
-        } else {
-            m_tiles.push_back({end, tile});
-        }
-    };
-    uint32_t tile = TileOf(run.first, y);
-    add(run.first + 1, tile);
-    for (int32_t x = run.first; x + 1 < run.end;) {
-        const int32_t last = std::min(x + kBlock, run.end - 1);
-        const uint32_t lastTile = TileOf(last, y);
-        const auto [lowU, highU] = std::minmax({map[x] & 0xFFFF, map[last] & 0xFFFF});
-        const auto [lowV, highV] = std::minmax({map[x] >> 16, map[last] >> 16});
-        bool between = tile == lastTile && lowU >= kSlack && lowV >= kSlack && highU <= kHighest &&
-                       highV <= kHighest;
-        for (int32_t i = x + 1; i < last; ++i) {
-            const uint32_t u = map[i] & 0xFFFF;
-            const uint32_t v = map[i] >> 16;
-            between = between && u + kSlack >= lowU && u <= highU + kSlack && v + kSlack >= lowV &&
-                      v <= highV + kSlack;
-        }
-        for (int32_t i = x + 1; !between && i < last; ++i) {
-            add(i + 1, TileOf(i, y));
-        }
-        add(last + 1, lastTile);
-        tile = lastTile;
-        x = last;
-    }
-}
-
-bool CFreeformPiP::BeginRows(const CImageARGB& source) {
-    return Prepare(&source, source.GetInstructionSet());
-}
-
-void CFreeformPiP::DrawRow(int32_t y, uint8_t* row) {
-    const bool wide = IsWide();
-    if (wide && m_bDirty) {
-        m_tileStarts[static_cast<size_t>(y)] = static_cast<uint32_t>(m_tiles.size());
-    }
-    for (const Run& run : m_spans.Row(y)) {
-        const auto count = static_cast<size_t>(run.end - run.first);
-        if (m_bDirty) {
-            BuildSpan(run.first, y, count);
-            if (wide) {
-                BuildTiles(run, y);
-            }
-        }
-        if (!wide) {
-            RenderSpan(row, run.first, y, count);
-        }
-    }
-    if (wide) {
-        RenderTiles(row, y);
-    }
-}
-
-void CFreeformPiP::RenderTiles(uint8_t* row, int32_t y) {
-    const SamplePicture whole = m_picture;
-    size_t next = m_tileStarts[static_cast<size_t>(y)];
-    for (const Run& run : m_spans.Row(y)) {
-        for (int32_t x = run.first; x < run.end;) {
-            const TileRun& tile = m_tiles[next++];
-            const auto left = static_cast<int32_t>(tile.tile & 0xFFFF) * kTileSize;
-            const auto top = static_cast<int32_t>(tile.tile >> 16) * kTileSize;
-            m_picture = {whole.pixels + top * whole.pitch + ptrdiff_t{4} * left, whole.pitch,
-                         whole.width - left, whole.height - top};
-            // Area coordinates go half a pixel beyond the picture.
-            if (m_picture.width > 0 && m_picture.height > 0) {
-                RenderSpan(row, x, y, static_cast<size_t>(tile.end - x));
-            }
-            x = tile.end;
-        }
-    }
-    m_picture = whole;
-}
-
 int32_t CFreeformPiP::Render(const CImageARGB& source, CImageARGB& destination) {
-    return Prepare(&source, source.GetInstructionSet()) ? DrawOn(destination) : 0;
+    return IsDestination(destination) && BeginRows(source) ? DrawOn(destination) : 0;
 }
 
 int32_t CFreeformPiP::RenderCheckerboard(CImageARGB& destination) {
-    if (m_nMapMode != MapMode_Nearest && m_nMapMode != MapMode_Bilinear) {
+    if (m_nSourceWidth <= 0 || m_nSourceHeight <= 0 || !IsDestination(destination) ||
+        (m_nMapMode != MapMode_Nearest && m_nMapMode != MapMode_Bilinear)) {
         return 0;
     }
-    return Prepare(nullptr, destination.GetInstructionSet()) ? DrawOn(destination) : 0;
+    m_picture = {nullptr, 0, m_nSourceWidth, m_nSourceHeight};
+    Prepare(destination.GetInstructionSet());
+    return DrawOn(destination);
 }
 
-// The callback stays installed after a drawing, and pixels that somebody else emits then find
-// nothing to draw on.
+bool CFreeformPiP::IsDestination(const CImageARGB& image) const {
+    return image.GetBuffer() && image.GetWidth() == m_nDestWidth &&
+           image.GetHeight() == m_nDestHeight;
+}
+
 int32_t CFreeformPiP::DrawOn(CImageARGB& destination) {
-    if (!destination.GetBuffer() || destination.GetWidth() != m_nDestWidth ||
-        destination.GetHeight() != m_nDestHeight) {
-        return 0;
+    for (int32_t y = 0; y < m_nDestHeight; ++y) {
+        DrawRow(y, destination.Row(y));
     }
-    if (IsWide()) { // whose tiles are told by rows
-        for (int32_t y = 0; y < m_nDestHeight; ++y) {
-            DrawRow(y, destination.Row(y));
-        }
-        m_bDirty = false;
-        return 1;
-    }
-    static const auto withCurrent = [](const RasterPixel& pixel, auto&& draw) {
-        CFreeformPiP* const pip = Current();
-        if (pip && pip->m_pDestination) {
-            draw(*pip, std::clamp(pixel.x, 0, pip->m_nDestWidth - 1),
-                 std::clamp(pixel.y, 0, pip->m_nDestHeight - 1));
-        }
-    };
-    const RasterWindow window = {0, 0, m_nDestWidth - 1, m_nDestHeight - 1};
-    const CRasterLock lock;
-    g_current = this;
-    m_pDestination = &destination;
-    struct Reset {
-        CImageARGB*& pointer;
-        ~Reset() { pointer = nullptr; }
-    } const reset = {m_pDestination};
-    if (m_bDirty) {
-        CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
-            withCurrent(*pixel,
-                        [](CFreeformPiP& pip, int32_t x, int32_t y) { pip.BuildSpan(x, y, 1); });
-        });
-        CRasterizer::FillQuadWithin(window, m_destPoints);
-        m_bDirty = false;
-    }
-    CRasterizer::SetPixelCallback([](const RasterPixel* pixel) {
-        withCurrent(*pixel, [](CFreeformPiP& pip, int32_t x, int32_t y) {
-            pip.RenderSpan(pip.m_pDestination->Row(y), x, y, 1);
-        });
-    });
-    CRasterizer::FillQuadWithin(window, m_destPoints);
+    EndRows();
     return 1;
+}
+
+bool CFreeformPiP::BeginRows(const CImageARGB& source) {
+    if (!source.GetBuffer() || source.GetWidth() != m_nSourceWidth ||
+        source.GetHeight() != m_nSourceHeight || m_nDestWidth <= 0 || m_nDestHeight <= 0) {
+        return false;
+    }
+    m_picture = {source.GetBuffer(), source.GetPitch(), m_nSourceWidth, m_nSourceHeight};
+    Prepare(source.GetInstructionSet());
+    return true;
+}
+
+void CFreeformPiP::Prepare(InstructionSet set) {
+    m_pMapRow = kQuadMapRow.For(set);
+    m_pSampleRow = kQuadSampleRow.For(set);
+    if (!m_bDirty) {
+        return;
+    }
+    Allocate();
+    RasterPointF quad[4], corners[4];
+    ToFloat(m_destPoints, quad);
+    ToFloat(m_sourcePoints, corners);
+    m_model.Set(quad, corners);
+    m_spans.Begin(m_nDestHeight);
+    CWindowWalk({0, 0, m_nDestWidth, m_nDestHeight})
+        .ClampQuad(m_destPoints,
+                   [&](int32_t y, int32_t first, int32_t last) { m_spans.Add(y, first, last); });
 }
 
 size_t CFreeformPiP::EntriesPerPixel() const {
@@ -307,71 +135,123 @@ size_t CFreeformPiP::EntriesPerPixel() const {
                                                                                    : 1;
 }
 
+size_t CFreeformPiP::PixelIndex(int32_t x, int32_t y) const {
+    return static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
+}
+
 // Room for the mode's map; what it holds is rebuilt in any case.
 void CFreeformPiP::Allocate() {
-    const auto pixels = static_cast<size_t>(m_nDestWidth) * static_cast<size_t>(m_nDestHeight);
-    if (m_nMapMode == MapMode_Filtered) {
-        m_records.clear();
-        m_records.resize(pixels * 2);
-        m_pSourceMap.reset();
-        m_mapEntries = 0;
-        return;
-    }
+    const bool filtered = m_nMapMode == MapMode_Filtered;
+    const size_t pixels = PixelIndex(0, m_nDestHeight);
     m_records.clear();
+    m_records.resize(filtered ? pixels * 2 : 0);
     m_records.shrink_to_fit();
-    const size_t entries = pixels * EntriesPerPixel();
+    const size_t entries = filtered ? 0 : pixels * EntriesPerPixel();
     if (entries != m_mapEntries) {
         m_pSourceMap.reset();
         m_mapEntries = 0;
         // Pages that no quad touches are never touched here either.
-        m_pSourceMap.reset(new uint32_t[entries]);
+        m_pSourceMap.reset(entries ? new uint32_t[entries] : nullptr);
         m_mapEntries = entries;
+    }
+    m_tiles.resize(static_cast<size_t>(m_nDestHeight));
+    for (std::vector<TileRun>& row : m_tiles) {
+        row.clear();
     }
 }
 
-void CFreeformPiP::BuildSpan(int32_t x, int32_t y, size_t count) {
-    if (m_nMapMode == MapMode_Filtered) {
-        BuildFiltered(x, y, count);
+void CFreeformPiP::DrawRow(int32_t y, uint8_t* row) {
+    std::vector<TileRun>& tiles = m_tiles[static_cast<size_t>(y)];
+    if (m_bDirty) {
+        for (const Run& run : m_spans.Row(y)) {
+            BuildRun(run, y);
+            FindTiles(run, y, tiles);
+        }
+    }
+    for (const TileRun& tile : tiles) {
+        SamplePicture picture = m_picture;
+        const auto left = static_cast<int32_t>(tile.tile & 0xFFFF) * kTileSize;
+        const auto top = static_cast<int32_t>(tile.tile >> 16) * kTileSize;
+        if (picture.pixels) {
+            picture.pixels += top * picture.pitch + ptrdiff_t{4} * left;
+        }
+        picture.width -= left;
+        picture.height -= top;
+        // Area coordinates go half a pixel beyond the picture.
+        if (picture.width > 0 && picture.height > 0) {
+            RenderRun(row + ptrdiff_t{4} * tile.run.first, tile.run, y, picture);
+        }
+    }
+}
+
+// The tile of a position is the whole part of its entry with the picture at 1/1024 of its size. The
+// operations are those of the map, and a double holds the part as exactly as the whole, so that
+// tile and entry fit together to the last bit.
+void CFreeformPiP::FindTiles(const Run& run, int32_t y, std::vector<TileRun>& tiles) {
+    const bool singles = m_nMapMode == MapMode_Nearest || m_nMapMode == MapMode_Bilinear;
+    if (!m_bWide || !singles || std::max(m_nSourceWidth, m_nSourceHeight) <= kTileSize) {
+        tiles.push_back({run, 0});
         return;
     }
-    const auto first =
-        static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
-    uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();
-    const bool bilinear = m_nQuadModel == QuadModel_InverseBilinear;
+    m_tileRow.resize(static_cast<size_t>(m_nDestWidth));
+    const auto end = m_tileRow.begin() + (run.end - run.first);
+    BuildEntries(m_tileRow.data(), run, y, 1.0 / kTileSize);
+    int32_t x = run.first;
+    for (auto entry = m_tileRow.begin(); entry != end;) {
+        const uint32_t tile = *entry >> 6 & kTileBits;
+        const auto next = std::find_if(
+            entry, end, [&](uint32_t other) { return (other >> 6 & kTileBits) != tile; });
+        const auto count = static_cast<int32_t>(next - entry);
+        tiles.push_back({{x, x + count}, tile});
+        x += count;
+        entry = next;
+    }
+}
+
+// One entry a pixel, with the picture at `scale` times its size.
+void CFreeformPiP::BuildEntries(uint32_t* map, const Run& run, int32_t y, double scale) const {
+    if (m_nQuadModel == QuadModel_InverseBilinear) {
+        m_pMapRow(map, run.first, static_cast<size_t>(run.end - run.first),
+                  m_model.PlanRow(y, scale));
+        return;
+    }
+    for (int32_t x = run.first; x < run.end; ++x) {
+        const QuadPoint point = m_model.WachspressPoint(x, y);
+        *map++ = MapEntry(point.u * scale, point.v * scale);
+    }
+}
+
+QuadPoint CFreeformPiP::PointAt(double x, double y) const {
+    return m_nQuadModel == QuadModel_InverseBilinear ? m_model.InverseBilinearPoint(x, y)
+                                                     : m_model.WachspressPoint(x, y);
+}
+
+void CFreeformPiP::BuildRun(const Run& run, int32_t y) {
+    if (m_nMapMode == MapMode_Filtered) {
+        BuildFiltered(run, y);
+        return;
+    }
+    uint32_t* map = m_pSourceMap.get() + PixelIndex(run.first, y) * EntriesPerPixel();
     if (EntriesPerPixel() == 1) {
-        if (bilinear) {
-            m_pMapRow(map, x, count, m_model.PlanRow(y));
-            return;
-        }
-        for (size_t i = 0; i < count; ++i) {
-            map[i] = m_model.WachspressEntry(x + static_cast<double>(i), y);
-        }
+        BuildEntries(map, run, y, 1.0);
         return;
     }
     // A regular grid about the pixel, a third of a pixel apart.
     constexpr double kOffsets[] = {-1.0 / 3.0, 0.0, 1.0 / 3.0};
-    for (size_t i = 0; i < count; ++i) {
+    for (int32_t x = run.first; x < run.end; ++x) {
         for (const double dy : kOffsets) {
             for (const double dx : kOffsets) {
-                const double px = x + static_cast<double>(i) + dx;
-                *map++ = bilinear ? m_model.InverseBilinearEntry(px, y + dy)
-                                  : m_model.WachspressEntry(px, y + dy);
+                const QuadPoint point = PointAt(x + dx, y + dy);
+                *map++ = MapEntry(point.u, point.v);
             }
         }
     }
 }
 
-void CFreeformPiP::BuildFiltered(int32_t x, int32_t y, size_t count) {
-    const auto first =
-        static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
-    for (size_t i = 0; i < count; ++i) {
-        const double px = x + static_cast<double>(i);
-        const QuadPoint point = m_nQuadModel == QuadModel_InverseBilinear
-                                    ? m_model.InverseBilinearPoint(px, y)
-                                    : m_model.WachspressPoint(px, y);
-        ContributionRecord* records = m_records.data() + (first + i) * 2;
-        records[0].reset();
-        records[1].reset();
+void CFreeformPiP::BuildFiltered(const Run& run, int32_t y) {
+    ContributionRecord* records = m_records.data() + PixelIndex(run.first, y) * 2;
+    for (int32_t x = run.first; x < run.end; ++x, records += 2) {
+        const QuadPoint point = PointAt(x, y);
         if (point.inside) {
             records[0] = MakeContribution(*m_pFilter, static_cast<float>(point.u), point.scaleU,
                                           m_nSourceWidth);
@@ -381,31 +261,30 @@ void CFreeformPiP::BuildFiltered(int32_t x, int32_t y, size_t count) {
     }
 }
 
-void CFreeformPiP::RenderSpan(uint8_t* row, int32_t x, int32_t y, size_t count) {
-    uint8_t* dst = row + ptrdiff_t{4} * x;
-    const auto first =
-        static_cast<size_t>(y) * static_cast<size_t>(m_nDestWidth) + static_cast<size_t>(x);
-    if (m_renderer == Renderer::Picture && m_nMapMode == MapMode_Filtered) {
-        RenderFiltered(dst, m_records.data() + first * 2, count, m_picture);
-        return;
-    }
+void CFreeformPiP::RenderRun(uint8_t* dst, const Run& run, int32_t y,
+                             const SamplePicture& picture) const {
+    const auto count = static_cast<size_t>(run.end - run.first);
+    const size_t first = PixelIndex(run.first, y);
     const uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();
-    if (m_renderer == Renderer::Checkerboard) {
+    if (!picture.pixels) {
         RenderChecker(dst, map, count);
         return;
     }
     switch (m_nMapMode) {
     case MapMode_Nearest:
-        RenderNearest(dst, map, count, m_picture);
+        RenderNearest(dst, map, count, picture);
         break;
     case MapMode_GridNearest:
-        RenderGridNearest(dst, map, count, m_picture);
-        break;
-    case MapMode_GridBilinear:
-        RenderGridBilinear(dst, map, count, m_picture);
+        RenderGridNearest(dst, map, count, picture);
         break;
     case MapMode_Bilinear:
-        m_pSampleRow(dst, map, count, m_picture);
+        m_pSampleRow(dst, map, count, picture);
+        break;
+    case MapMode_GridBilinear:
+        RenderGridBilinear(dst, map, count, picture);
+        break;
+    case MapMode_Filtered:
+        RenderFiltered(dst, m_records.data() + first * 2, count, picture);
         break;
     default:
         break;

@@ -7,11 +7,7 @@
 //
 // A wide map is told in addition which 1024 columns and rows those are, for runs of pixels.
 //
-// Render draws a whole image, pixel by pixel through the rasterizer's callback. That is
-// process-wide and works on the object that is the current one; a drawing object makes itself
-// current and holds the rasterizer's lock until it has drawn, so that instances on different
-// threads take turns. DrawRow draws row by row, by whole spans and without any shared state, to the
-// same bytes.
+// Drawing goes row by row, by whole spans of pixels and without any state that the process shares.
 #pragma once
 
 #include <cstddef>
@@ -42,10 +38,9 @@ public:
         MapMode_Filtered = 4,
     };
 
-    // Becomes the current object. Inverse bilinear, bilinear, Lanczos3.
+    // Inverse bilinear, bilinear, Lanczos3.
     CFreeformPiP();
-    // An object that is current leaves none behind.
-    virtual ~CFreeformPiP();
+    virtual ~CFreeformPiP() = default;
 
     CFreeformPiP(const CFreeformPiP&) = delete;
     CFreeformPiP& operator=(const CFreeformPiP&) = delete;
@@ -98,25 +93,26 @@ public:
     // drawing, null before the first. Mode 4 keeps none.
     const uint32_t* SourceMap() const { return m_pSourceMap.get(); }
 
-    // The object that the pixel callbacks work on: the last one constructed, or the last to have
-    // rendered. Null when that is gone.
-    static CFreeformPiP* Current();
-
 private:
-    enum class Renderer { Picture, Checkerboard };
+    // A run of pixels whose entries address the same 1024 columns and rows of the picture.
+    struct TileRun {
+        Run run;
+        uint32_t tile; // column in the low 16 bits, row in the high ones, in tiles
+    };
 
+    int32_t StorePoints(const RasterPoint* points, int32_t count, RasterPoint (&stored)[4]);
+    bool IsDestination(const KYVImageUtility::CImageARGB& image) const;
     int32_t DrawOn(KYVImageUtility::CImageARGB& destination);
-    bool Prepare(const KYVImageUtility::CImageARGB* source, InstructionSet set);
+    void Prepare(InstructionSet set);
     void Allocate();
-    void BuildSpan(int32_t x, int32_t y, size_t count);
-    bool IsWide() const;
-    void RenderTiles(uint8_t* row, int32_t y);
-    void BuildTiles(const Run& run, int32_t y);
-    uint32_t TileOf(int32_t x, int32_t y) const;
-    void BuildFiltered(int32_t x, int32_t y, size_t count);
-    void RenderSpan(uint8_t* row, int32_t x, int32_t y, size_t count);
     size_t EntriesPerPixel() const;
-    static bool StorePoints(const RasterPoint* points, int32_t count, RasterPoint (&stored)[4]);
+    size_t PixelIndex(int32_t x, int32_t y) const;
+    void FindTiles(const Run& run, int32_t y, std::vector<TileRun>& tiles);
+    void BuildEntries(uint32_t* map, const Run& run, int32_t y, double scale) const;
+    QuadPoint PointAt(double x, double y) const;
+    void BuildRun(const Run& run, int32_t y);
+    void BuildFiltered(const Run& run, int32_t y);
+    void RenderRun(uint8_t* dst, const Run& run, int32_t y, const SamplePicture& picture) const;
 
     static constexpr int32_t kPointLimit = 4;
 
@@ -126,33 +122,22 @@ private:
     int32_t m_nDestHeight = 0;
     RasterPoint m_destPoints[kPointLimit] = {};
     RasterPoint m_sourcePoints[kPointLimit] = {};
-    bool m_bSizeSet = false;
     bool m_bDirty = true;
     int32_t m_nQuadModel = QuadModel_InverseBilinear;
     int32_t m_nMapMode = MapMode_Bilinear;
     int32_t m_nOption = 0;
+    bool m_bWide = false;
     const ResampleFilter* m_pFilter;
     CQuadModel m_model;
     std::unique_ptr<uint32_t[]> m_pSourceMap;
     size_t m_mapEntries = 0;
     std::vector<ContributionRecord> m_records; // mode 4: horizontal and vertical, by pixel
-
     CSpanRows m_spans;
+    std::vector<std::vector<TileRun>> m_tiles; // by row of the frame
+    std::vector<uint32_t> m_tileRow;           // entries whose whole part is a tile
 
-    // A wide map: where in the picture the 1024 columns and rows lie that entries address, by runs
-    // of pixels up to a column.
-    struct TileRun {
-        int32_t end;
-        uint32_t tile; // column in the low 16 bits, row in the high ones, in tiles
-    };
-    bool m_bWide = false;
-    std::vector<TileRun> m_tiles;
-    std::vector<uint32_t> m_tileStarts; // by row of the frame
-
-    // While drawing: what to read, for Render where to write, and with which forms.
+    // While drawing: what to read, null for a checkerboard, and with which forms.
     SamplePicture m_picture = {};
-    KYVImageUtility::CImageARGB* m_pDestination = nullptr;
-    Renderer m_renderer = Renderer::Picture;
     QuadMapRow m_pMapRow = nullptr;
     QuadSampleRow m_pSampleRow = nullptr;
 };

@@ -30,7 +30,7 @@ void CQuadModel::Set(const RasterPointF (&quad)[4], const RasterPointF (&picture
 //
 // The derivatives at the solution are the Jacobian, negative for s and positive for t. The root
 // with -sqrt needs it negative where the quad lies, which the orientation settles.
-QuadMapRowPlan CQuadModel::PlanRow(double y) const {
+QuadMapRowPlan CQuadModel::PlanRow(double y, double scale) const {
     const double o = m_orientation;
     const double ax = m_quad[0].x;
     const double hy = y - m_quad[0].y;
@@ -50,15 +50,11 @@ QuadMapRowPlan CQuadModel::PlanRow(double y) const {
         .c_s = {o * hf.base, o * hf.step},
         .b_t = {-o * (hg.base + ef), -o * hg.step},
         .c_t = {-o * he.base, -o * he.step},
-        .originU = m_picture[0].x,
-        .originV = m_picture[0].y,
-        .rangeU = double{m_picture[2].x} - m_picture[0].x,
-        .rangeV = double{m_picture[2].y} - m_picture[0].y,
+        .originU = scale * m_picture[0].x,
+        .originV = scale * m_picture[0].y,
+        .rangeU = scale * (double{m_picture[2].x} - m_picture[0].x),
+        .rangeV = scale * (double{m_picture[2].y} - m_picture[0].y),
     };
-}
-
-uint32_t CQuadModel::InverseBilinearEntry(double x, double y) const {
-    return MapEntry(PlanRow(y), x);
 }
 
 QuadPoint CQuadModel::InverseBilinearPoint(double x, double y) const {
@@ -100,11 +96,6 @@ QuadPoint CQuadModel::WachspressPoint(double x, double y) const {
     SetScales(point, (point.u - m_picture[0].x) / (double{m_picture[2].x} - m_picture[0].x),
               (point.v - m_picture[0].y) / (double{m_picture[2].y} - m_picture[0].y));
     return point;
-}
-
-uint32_t CQuadModel::WachspressEntry(double x, double y) const {
-    const QuadPoint point = WachspressPoint(x, y);
-    return point.inside ? MapEntry(point.u, point.v) : kOutside;
 }
 
 // The line of constant t through the point is |e + t g| long, and that of constant s |f + s g|.

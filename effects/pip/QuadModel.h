@@ -24,21 +24,16 @@ public:
     // The corners A, B, C, D of the quad and of the picture, all within +-kFarthestPoint.
     void Set(const RasterPointF (&quad)[4], const RasterPointF (&picture)[4]);
 
-    // The inverse bilinear map of row y. What the map covers is everything: outside the quad the
-    // nearest edge of the picture, more or less.
-    QuadMapRowPlan PlanRow(double y) const;
-    uint32_t InverseBilinearEntry(double x, double y) const;
+    // The inverse bilinear map of row y, with the picture at `scale` times its size. What the map
+    // covers is everything: outside the quad the nearest edge of the picture, more or less.
+    QuadMapRowPlan PlanRow(double y, double scale = 1.0) const;
     QuadPoint InverseBilinearPoint(double x, double y) const;
 
     // Wachspress coordinates: every corner's weight is the area of the triangle that it makes with
     // its neighbours over the product of those that the position makes with its two sides.
-    // kOutside where they are not all positive: outside the quad, on its edges, and anywhere in a
-    // quad that is not convex.
-    uint32_t WachspressEntry(double x, double y) const;
+    // u = v = 1023 where they are not all positive: outside the quad, on its edges, and anywhere in
+    // a quad that is not convex. It is also the last position that an entry can hold.
     QuadPoint WachspressPoint(double x, double y) const;
-
-    // An entry with u = v = 1023, which is also the last position that an entry can hold.
-    static constexpr uint32_t kOutside = (1023u * 64) << 16 | 1023u * 64;
 
 private:
     struct Vector {

@@ -18,27 +18,24 @@ public:
         Emit(pixel, x, y);
     }
 
-    auto TriangleFiller(const RasterPoint (&vertices)[3]) const {
-        return [this, &vertices](int32_t y, int32_t first, int32_t last) {
+    template <class Point>
+    void FillTriangle(const Point* a, const Point* b, const Point* c) const {
+        if (!a || !b || !c) {
+            return;
+        }
+        const RasterPoint vertices[3] = {Truncate(*a), Truncate(*b), Truncate(*c)};
+        WalkTriangle(vertices, [&](int32_t y, int32_t first, int32_t last) {
             for (int64_t x = first; x <= last; ++x) {
                 RasterPixel pixel = {0, 0, {}, {vertices[0], vertices[1], vertices[2]}};
                 Emit(pixel, x, y);
             }
-        };
+        });
     }
 
-    void FillTriangle(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c) const {
-        if (a && b && c) {
-            const RasterPoint vertices[3] = {*a, *b, *c};
-            WalkTriangle(vertices, TriangleFiller(vertices));
-        }
-    }
-
-    void FillTriangle(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c) const {
-        if (a && b && c) {
-            const RasterPoint vertices[3] = {Truncate(*a), Truncate(*b), Truncate(*c)};
-            WalkTriangle(vertices, TriangleFiller(vertices));
-        }
+    template <class Point>
+    void FillQuad(const Point* a, const Point* b, const Point* c, const Point* d) const {
+        FillTriangle(a, b, c);
+        FillTriangle(a, c, d);
     }
 
     // (+-u, +-v) about the centre.
@@ -67,8 +64,6 @@ private:
 };
 
 } // namespace
-
-std::mutex CRasterLock::s_mutex;
 
 void CRasterizer::SetPixelCallback(RasterPixelCallback callback) {
     g_callback = callback;
@@ -123,9 +118,7 @@ void CRasterizer::FillTriangle(const RasterPoint* a, const RasterPoint* b, const
 
 void CRasterizer::FillQuad(const RasterPoint* a, const RasterPoint* b, const RasterPoint* c,
                            const RasterPoint* d) {
-    const CPen pen;
-    pen.FillTriangle(a, b, c);
-    pen.FillTriangle(a, c, d);
+    CPen().FillQuad(a, b, c, d);
 }
 
 void CRasterizer::FillTriangleF(const RasterPointF* a, const RasterPointF* b,
@@ -135,32 +128,7 @@ void CRasterizer::FillTriangleF(const RasterPointF* a, const RasterPointF* b,
 
 void CRasterizer::FillQuadF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c,
                             const RasterPointF* d) {
-    const CPen pen;
-    pen.FillTriangle(a, b, c);
-    pen.FillTriangle(a, c, d);
-}
-
-void CRasterizer::FillQuadWithin(const RasterWindow& window, const RasterPoint (&quad)[4]) {
-    const CPen pen;
-    const CWindowWalk walk(window);
-    for (const int third : {2, 3}) {
-        const RasterPoint vertices[3] = {quad[0], quad[third - 1], quad[third]};
-        walk.ClampTriangle(vertices, pen.TriangleFiller(vertices));
-    }
-}
-
-void CRasterizer::FillTriangleInside(const RasterWindow& window, const RasterPoint (&triangle)[3]) {
-    const CPen pen;
-    CWindowWalk(window).ClipTriangle(triangle, pen.TriangleFiller(triangle));
-}
-
-void CRasterizer::FillCircleInside(const RasterWindow& window, RasterPoint centre, int32_t radius) {
-    const CPen pen;
-    CWindowWalk(window).ClipCircle(centre, radius, [&](int32_t y, int32_t first, int32_t last) {
-        for (int32_t x = first; x <= last; ++x) {
-            pen.Plot(x, y);
-        }
-    });
+    CPen().FillQuad(a, b, c, d);
 }
 
 void CRasterizer::PlotEightWay(int32_t centreX, int32_t centreY, int32_t u, int32_t v) {

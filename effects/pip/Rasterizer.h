@@ -7,13 +7,12 @@
 //
 // Every primitive hands all its pixels to the one callback that the process has when the primitive
 // is called. It is null at first and stays until it is replaced; without one nothing is emitted.
-// The callback is not guarded: whoever draws through it holds CRasterLock meanwhile. Code that
-// wants whole spans, and no state shared by the process, takes them from effects/pip/SpanWalk.h, on
-// which the primitives stand.
+// The callback is not guarded, so drawing is one thread's affair at a time. Frames are drawn by
+// whole spans and without any state shared by the process, on the walks of effects/pip/SpanWalk.h,
+// on which the primitives stand too.
 #pragma once
 
 #include <cstdint>
-#include <mutex>
 
 #include "platform/Truncate.h"
 
@@ -31,14 +30,6 @@ struct RasterPointF {
     float y;
 };
 
-// Columns left to right and rows top to bottom, both ends inside; never empty.
-struct RasterWindow {
-    int32_t left;
-    int32_t top;
-    int32_t right;
-    int32_t bottom;
-};
-
 struct RasterPixel {
     int32_t x;
     int32_t y;
@@ -47,17 +38,6 @@ struct RasterPixel {
 };
 
 using RasterPixelCallback = void (*)(const RasterPixel* pixel);
-
-// Held by everything that sets the callback and draws through it, so that instances on different
-// threads take turns. Not recursive.
-class CRasterLock {
-public:
-    CRasterLock() : m_lock(s_mutex) {}
-
-private:
-    static std::mutex s_mutex;
-    std::lock_guard<std::mutex> m_lock;
-};
 
 class CRasterizer {
 public:
@@ -90,14 +70,6 @@ public:
     static void FillQuadF(const RasterPointF* a, const RasterPointF* b, const RasterPointF* c,
                           const RasterPointF* d);
 
-    // For frames: the pixels of FillQuad with every position outside the window moved to the
-    // nearest one inside. What lies outside costs next to nothing, however far away it is, and is
-    // repeated less often.
-    static void FillQuadWithin(const RasterWindow& window, const RasterPoint (&quad)[4]);
-    // For frames: the pixels of FillTriangle and of FillCircle that are inside the window.
-    static void FillTriangleInside(const RasterWindow& window, const RasterPoint (&triangle)[3]);
-    static void FillCircleInside(const RasterWindow& window, RasterPoint centre, int32_t radius);
-
     // The points (+-u, +-v) and (+-v, +-u) about the centre; those that coincide are repeated.
     static void PlotEightWay(int32_t centreX, int32_t centreY, int32_t u, int32_t v);
     // The outline of a midpoint circle in eight-way points; radius 0 is the centre, and nothing for
@@ -107,6 +79,9 @@ public:
     static void DrawEllipse(int32_t centreX, int32_t centreY, int32_t radiusX, int32_t radiusY);
 };
 
+inline RasterPoint Truncate(const RasterPoint& point) {
+    return point;
+}
 inline RasterPoint Truncate(const RasterPointF& point) {
     return {TruncateToInt(point.x), TruncateToInt(point.y)};
 }

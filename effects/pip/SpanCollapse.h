@@ -23,32 +23,30 @@
 #include <algorithm>
 #include <cstdint>
 
+#include "effects/pip/Rasterizer.h"
+
 namespace kyv {
 
 // One side of a triangle: the column in every row, rising or falling all the way down.
 class CTriangleSide {
 public:
-    struct Point {
-        int64_t x;
-        int64_t y;
-    };
-
-    constexpr CTriangleSide(Point from, Point to) : m_from(from), m_to(to) {}
+    constexpr CTriangleSide(RasterPoint from, RasterPoint to) : m_from(from), m_to(to) {}
 
     // A side without height is at its second end, where the walk's rules want it.
     constexpr int64_t At(int64_t y) const {
-        const int64_t height = m_to.y - m_from.y;
+        const int64_t height = int64_t{m_to.y} - m_from.y;
         return height == 0 ? m_to.x : (m_to.x * (y - m_from.y) + m_from.x * (m_to.y - y)) / height;
     }
 
     // At most one column from row to row.
     constexpr bool IsSteep() const {
-        return std::max(m_to.x - m_from.x, m_from.x - m_to.x) <= m_to.y - m_from.y;
+        const int64_t width = int64_t{m_to.x} - m_from.x;
+        return std::max(width, -width) <= int64_t{m_to.y} - m_from.y;
     }
 
 private:
-    Point m_from;
-    Point m_to;
+    RasterPoint m_from;
+    RasterPoint m_to;
 };
 
 // Columns left to right, both ends inside.

@@ -2,25 +2,16 @@
 #include "effects/pip/SpanRows.h"
 
 namespace kyv {
-namespace {
-
-// Appends a run that begins no further left than those before it; from `floor` on they are of the
-// same row.
-void Append(Runs& runs, size_t floor, Run run) {
-    if (runs.size() > floor && run.first <= runs.back().end) {
-        runs.back().end = std::max(runs.back().end, run.end);
-    } else {
-        runs.push_back(run);
-    }
-}
-
-} // namespace
-
 void Unite(std::span<const Run> a, std::span<const Run> b, Runs& out) {
     out.clear();
     for (size_t i = 0, j = 0; i < a.size() || j < b.size();) {
         const bool takeA = j == b.size() || (i < a.size() && a[i].first <= b[j].first);
-        Append(out, 0, takeA ? a[i++] : b[j++]);
+        const Run run = takeA ? a[i++] : b[j++];
+        if (!out.empty() && run.first <= out.back().end) {
+            out.back().end = std::max(out.back().end, run.end);
+        } else {
+            out.push_back(run);
+        }
     }
 }
 
@@ -45,55 +36,43 @@ void Subtract(std::span<const Run> a, std::span<const Run> b, Runs& out) {
 }
 
 void CSpanRows::Begin(int32_t rows) {
-    m_added.clear();
-    m_runs.clear();
-    m_starts.assign(static_cast<size_t>(rows) + 1, 0);
+    m_rows.resize(static_cast<size_t>(rows));
+    for (Runs& row : m_rows) {
+        row.clear();
+    }
     m_bounds = {};
 }
 
-void CSpanRows::Finish() {
-    // By row first, in the order of addition, then within each row.
-    for (const Added& added : m_added) {
-        ++m_starts[static_cast<size_t>(added.y)];
+void CSpanRows::Add(int32_t y, int32_t first, int32_t last) {
+    Runs& row = m_rows[static_cast<size_t>(y)];
+    Run run = {first, last + 1};
+    const auto from = std::lower_bound(row.begin(), row.end(), first,
+                                       [](const Run& a, int32_t column) { return a.end < column; });
+    auto to = from;
+    for (; to != row.end() && to->first <= run.end; ++to) {
+        run = {std::min(run.first, to->first), std::max(run.end, to->end)};
     }
-    uint32_t end = 0;
-    for (uint32_t& start : m_starts) {
-        end += start;
-        start = end;
+    if (from == to) {
+        row.insert(from, run);
+    } else {
+        *from = run;
+        row.erase(from + 1, to);
     }
-    m_runs.resize(m_added.size());
-    for (const Added& added : m_added) {
-        m_runs[--m_starts[static_cast<size_t>(added.y)]] = added.run;
+    m_bounds = m_bounds.About({first, y, last + 1, y + 1});
+}
+
+bool CSpanRows::Replace(int32_t y, const Runs& runs) {
+    Runs& row = m_rows[static_cast<size_t>(y)];
+    if (row == runs) {
+        return false;
     }
-    size_t kept = 0;
-    for (size_t y = 0; y + 1 < m_starts.size(); ++y) {
-        const auto first = m_runs.begin() + m_starts[y];
-        const auto last = m_runs.begin() + m_starts[y + 1];
-        std::sort(first, last, [](const Run& a, const Run& b) { return a.first < b.first; });
-        const size_t row = kept;
-        for (auto run = first; run != last; ++run) {
-            if (kept > row && run->first <= m_runs[kept - 1].end) {
-                m_runs[kept - 1].end = std::max(m_runs[kept - 1].end, run->end);
-            } else {
-                m_runs[kept++] = *run;
-            }
-        }
-        m_starts[y] = static_cast<uint32_t>(row);
-        if (kept > row) {
-            const auto top = static_cast<int32_t>(y);
-            m_bounds = m_bounds.About({m_runs[row].first, top, m_runs[kept - 1].end, top + 1});
-        }
-    }
-    m_starts.back() = static_cast<uint32_t>(kept);
-    m_runs.resize(kept);
+    row = runs;
+    return true;
 }
 
 std::span<const Run> CSpanRows::Row(int32_t y) const {
-    if (y < 0 || static_cast<size_t>(y) + 1 >= m_starts.size()) {
-        return {};
-    }
-    const size_t row = static_cast<size_t>(y);
-    return {m_runs.data() + m_starts[row], m_starts[row + 1] - m_starts[row]};
+    const bool inside = y >= 0 && static_cast<size_t>(y) < m_rows.size();
+    return inside ? std::span<const Run>(m_rows[static_cast<size_t>(y)]) : std::span<const Run>();
 }
 
 void CRowExtents::Extent::Include(const Extent& other) {

@@ -55,29 +55,23 @@ using Runs = std::vector<Run>;
 void Unite(std::span<const Run> a, std::span<const Run> b, Runs& out);
 void Subtract(std::span<const Run> a, std::span<const Run> b, Runs& out);
 
-// Shapes of one frame: first all Adds, in any order and overlapping as they like, then Finish.
-// Memory is kept from one Begin to the next.
+// What covers each row of a frame. Memory is kept from one Begin to the next.
 class CSpanRows {
 public:
     void Begin(int32_t rows);
-    // Columns first to last of row y, both inside; 0 <= y < rows.
-    void Add(int32_t y, int32_t first, int32_t last) { m_added.push_back({y, {first, last + 1}}); }
-    void Finish();
+    // Columns first to last of row y, both inside; 0 <= y < rows. In any order, and overlapping as
+    // they like.
+    void Add(int32_t y, int32_t first, int32_t last);
+    // False when the row, 0 <= y < rows, has just these.
+    bool Replace(int32_t y, const Runs& runs);
 
     // Empty for a row outside the frame.
     std::span<const Run> Row(int32_t y) const;
-    // About all runs; empty without any.
+    // About all runs that were added; empty without any.
     const PixelBox& Bounds() const { return m_bounds; }
 
 private:
-    struct Added {
-        int32_t y;
-        Run run;
-    };
-
-    std::vector<Added> m_added;
-    std::vector<uint32_t> m_starts; // of each row in m_runs, with the end of the last
-    Runs m_runs;
+    std::vector<Runs> m_rows;
     PixelBox m_bounds = {};
 };
 

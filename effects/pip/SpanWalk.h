@@ -11,6 +11,7 @@
 
 #include "effects/pip/Rasterizer.h"
 #include "effects/pip/SpanCollapse.h"
+#include "effects/pip/SpanRows.h"
 #include "platform/WrapMath.h"
 
 namespace kyv {
@@ -38,37 +39,48 @@ constexpr TriangleOrder OrderByHeight(const RasterPoint (&v)[3]) {
     return {v[0], v[1], v[2]};
 }
 
+// take(a, b, top, bottom) for the rows of a triangle above and then below its middle vertex, both
+// ends inside, with the sides that they lie between.
+template <class Side, class Take>
+void WalkHalves(const RasterPoint (&vertices)[3], Take&& take) {
+    const TriangleOrder t = OrderByHeight(vertices);
+    if (t.top.y == t.middle.y) {
+        // The one row lies between these two, wherever the third vertex is.
+        take(Side(t.middle, t.middle), Side(t.top, t.top), t.top.y, t.top.y);
+    } else {
+        take(Side(t.top, t.middle), Side(t.top, t.bottom), t.top.y, t.middle.y);
+    }
+    take(Side(t.middle, t.bottom), Side(t.top, t.bottom), int64_t{t.middle.y} + 1, t.bottom.y);
+}
+
+// A side whose products wrap where 32 bits do not hold them.
+class CWrappingSide {
+public:
+    CWrappingSide(RasterPoint from, RasterPoint to) : m_from(from), m_to(to) {}
+
+    int32_t At(int32_t y) const {
+        const int32_t height = WrapSub(m_to.y, m_from.y);
+        const int32_t sum =
+            WrapAdd(WrapMul(m_to.x, WrapSub(y, m_from.y)), WrapMul(m_from.x, WrapSub(m_to.y, y)));
+        // A height that wraps to -1 must not meet the one quotient that does not fit.
+        return height == 0 ? m_to.x : height == -1 ? WrapSub(0, sum) : sum / height;
+    }
+
+private:
+    RasterPoint m_from;
+    RasterPoint m_to;
+};
+
 // emit(y, first, last) for every row of the triangle, first <= last.
 template <class Emit>
 void WalkTriangle(const RasterPoint (&vertices)[3], Emit&& emit) {
-    // Wraps where 32 bits do not hold the products; a difference that wraps to -1 must not meet the
-    // one quotient that does not fit.
-    constexpr auto interpolate = [](RasterPoint from, RasterPoint to, int32_t y) {
-        const int32_t sum =
-            WrapAdd(WrapMul(to.x, WrapSub(y, from.y)), WrapMul(from.x, WrapSub(to.y, y)));
-        switch (const int32_t height = WrapSub(to.y, from.y)) {
-        case 0:
-            return to.x;
-        case -1:
-            return WrapSub(0, sum);
-        default:
-            return sum / height;
-        }
-    };
-    const TriangleOrder t = OrderByHeight(vertices);
-    for (int64_t row = t.top.y; row <= t.bottom.y; ++row) {
-        const auto y = static_cast<int32_t>(row);
-        int32_t a = t.middle.x;
-        int32_t b = t.top.x;
-        if (y > t.middle.y) {
-            a = interpolate(t.middle, t.bottom, y);
-            b = interpolate(t.top, t.bottom, y);
-        } else if (t.middle.y != t.top.y) {
-            a = interpolate(t.top, t.middle, y);
-            b = interpolate(t.top, t.bottom, y);
-        }
-        emit(y, std::min(a, b), std::max(a, b));
-    }
+    WalkHalves<CWrappingSide>(
+        vertices, [&](const CWrappingSide& a, const CWrappingSide& b, int64_t top, int64_t bottom) {
+            for (int64_t row = top; row <= bottom; ++row) {
+                const auto y = static_cast<int32_t>(row);
+                emit(y, std::min(a.At(y), b.At(y)), std::max(a.At(y), b.At(y)));
+            }
+        });
 }
 
 // emit(below, above, first, last) for every pair of rows of a disc: the row below the centre and
@@ -97,16 +109,18 @@ void WalkCircle(RasterPoint centre, int32_t radius, Emit&& emit) {
     }
 }
 
+// Walks over a window, which must not be empty.
 class CWindowWalk {
 public:
-    explicit CWindowWalk(const RasterWindow& window) : m_window(window) {}
+    explicit CWindowWalk(const PixelBox& window)
+        : m_top(window.top), m_bottom(window.bottom - 1), m_columns{window.left, window.right - 1} {
+    }
 
     // emit(y, first, last) for the part of every span that is inside.
     template <class Emit>
     void ClipTriangle(const RasterPoint (&vertices)[3], Emit&& emit) const {
         ForHalves(vertices, [&](const TriangleHalf& half) {
-            const int64_t end = std::min<int64_t>(half.bottom, m_window.bottom);
-            for (int64_t y = std::max<int64_t>(half.top, m_window.top); y <= end; ++y) {
+            for (int64_t y = std::max(half.top, m_top); y <= std::min(half.bottom, m_bottom); ++y) {
                 const int64_t a = half.a.At(y);
                 const int64_t b = half.b.At(y);
                 EmitInside(y, std::min(a, b), std::max(a, b), emit);
@@ -118,7 +132,7 @@ public:
     void ClipCircle(RasterPoint centre, int32_t radius, Emit&& emit) const {
         WalkCircle(centre, radius, [&](int64_t below, int64_t above, int64_t first, int64_t last) {
             for (const int64_t y : {below, above}) {
-                if (y >= m_window.top && y <= m_window.bottom) {
+                if (y >= m_top && y <= m_bottom) {
                     EmitInside(y, first, last, emit);
                 }
             }
@@ -129,21 +143,17 @@ public:
     // moved to the nearest one inside.
     template <class Emit>
     void ClampTriangle(const RasterPoint (&vertices)[3], Emit&& emit) const {
-        const Columns window = {m_window.left, m_window.right};
         ForHalves(vertices, [&](const TriangleHalf& half) {
-            const auto collapse = [&](int64_t top, int64_t bottom, int32_t target) {
-                Collapse(half, top, bottom, window,
-                         [&](Columns c) { emit(target, c.first, c.last); });
+            const auto collapse = [&](int64_t top, int64_t bottom, int64_t target) {
+                Collapse(half, top, bottom, m_columns,
+                         [&](Columns c) { emit(static_cast<int32_t>(target), c.first, c.last); });
             };
-            collapse(half.top, std::min<int64_t>(half.bottom, int64_t{m_window.top} - 1),
-                     m_window.top);
-            const int64_t end = std::min<int64_t>(half.bottom, m_window.bottom);
-            for (int64_t y = std::max<int64_t>(half.top, m_window.top); y <= end; ++y) {
-                const Columns row = half.Hull(y, y, window);
+            collapse(half.top, std::min(half.bottom, m_top - 1), m_top);
+            for (int64_t y = std::max(half.top, m_top); y <= std::min(half.bottom, m_bottom); ++y) {
+                const Columns row = half.Hull(y, y, m_columns);
                 emit(static_cast<int32_t>(y), row.first, row.last);
             }
-            collapse(std::max<int64_t>(half.top, int64_t{m_window.bottom} + 1), half.bottom,
-                     m_window.bottom);
+            collapse(std::max(half.top, m_bottom + 1), half.bottom, m_bottom);
         });
     }
 
@@ -157,30 +167,24 @@ public:
 private:
     template <class Take>
     static void ForHalves(const RasterPoint (&vertices)[3], Take&& take) {
-        const TriangleOrder t = OrderByHeight(vertices);
-        const auto side = [](RasterPoint from, RasterPoint to) {
-            return CTriangleSide({from.x, from.y}, {to.x, to.y});
-        };
-        if (t.middle.y == t.top.y) {
-            // The one row lies between these two, wherever the third vertex is.
-            take({side(t.middle, t.middle), side(t.top, t.top), t.top.y, t.top.y});
-        } else {
-            take({side(t.top, t.middle), side(t.top, t.bottom), t.top.y, t.middle.y});
-        }
-        take(
-            {side(t.middle, t.bottom), side(t.top, t.bottom), int64_t{t.middle.y} + 1, t.bottom.y});
+        WalkHalves<CTriangleSide>(vertices, [&](const CTriangleSide& a, const CTriangleSide& b,
+                                                int64_t top, int64_t bottom) {
+            take(TriangleHalf{a, b, top, bottom});
+        });
     }
 
     template <class Emit>
     void EmitInside(int64_t y, int64_t first, int64_t last, Emit&& emit) const {
-        first = std::max<int64_t>(first, m_window.left);
-        last = std::min<int64_t>(last, m_window.right);
+        first = std::max<int64_t>(first, m_columns.first);
+        last = std::min<int64_t>(last, m_columns.last);
         if (first <= last) {
             emit(static_cast<int32_t>(y), static_cast<int32_t>(first), static_cast<int32_t>(last));
         }
     }
 
-    RasterWindow m_window;
+    int64_t m_top;
+    int64_t m_bottom; // inside
+    Columns m_columns;
 };
 
 } // namespace kyv

@@ -773,14 +773,13 @@ TEST(Freeform, BordersJoinAtDoubledCorners) {
     const RasterPoint points[3] = {{30, 30}, {80, 40}, {125, 70}};
     std::vector<Runs> rows[3]; // a wide border, of which a wide turn leaves some to its wedge alone
     for (size_t twice = 0; twice < 3; ++twice) {
-        RasterPoint quad[4];
+        BorderShape shape = {160, 100, {}, 40};
         for (size_t i = 0; i < 4; ++i) {
-            quad[i] = points[i <= twice ? i : i - 1];
+            shape.corners[i] = points[i <= twice ? i : i - 1];
         }
         CSpanRows spans;
         spans.Begin(100);
-        AddBorderShape(spans, {0, 0, 159, 99}, quad, 40);
-        spans.Finish();
+        AddBorderShape(spans, shape);
         for (int y = 0; y < 100; ++y) {
             rows[twice].emplace_back(spans.Row(y).begin(), spans.Row(y).end());
         }

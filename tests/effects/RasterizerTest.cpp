@@ -293,7 +293,7 @@ TEST(Rasterizer, WindowsClampQuadsAndCutShapes) {
     std::mt19937 random(4);
     for (int i = 0; i < 4000; ++i) {
         const int width = 1 + static_cast<int>(random() % 9);
-        const RasterWindow window = {-2, 3, -3 + width, 3 + static_cast<int>(random() % 6)};
+        const PixelBox window = {-2, 3, -2 + width, 4 + static_cast<int>(random() % 6)};
         const int range = i % 2 ? 14 : 60;
         RasterPoint quad[4];
         for (RasterPoint& corner : quad) {
@@ -302,38 +302,46 @@ TEST(Rasterizer, WindowsClampQuadsAndCutShapes) {
                 corner.y /= 8; // flat slivers leave gaps between their rows
             }
         }
+        const CWindowWalk walk(window);
+        const auto walked = [](auto take) {
+            Shape shape;
+            take([&](int y, int first, int last) {
+                for (int x = first; x <= last; ++x) {
+                    shape.emplace(x, y);
+                }
+            });
+            return shape;
+        };
         Shape clamped;
         for (const auto& [x, y] :
              Emitted([&] { CRasterizer::FillQuad(&quad[0], &quad[1], &quad[2], &quad[3]); })) {
-            clamped.emplace(std::clamp(x, window.left, window.right),
-                            std::clamp(y, window.top, window.bottom));
+            clamped.emplace(std::clamp(x, window.left, window.right - 1),
+                            std::clamp(y, window.top, window.bottom - 1));
         }
-        ASSERT_EQ(Positions(Emitted([&] { CRasterizer::FillQuadWithin(window, quad); })), clamped)
-            << "quad " << i;
+        ASSERT_EQ(walked([&](auto add) { walk.ClampQuad(quad, add); }), clamped) << "quad " << i;
 
         const auto inside = [&](const Stream& stream) {
             Shape shape;
             for (const auto& [x, y] : stream) {
-                if (x >= window.left && x <= window.right && y >= window.top &&
-                    y <= window.bottom) {
+                if (x >= window.left && x < window.right && y >= window.top && y < window.bottom) {
                     shape.emplace(x, y);
                 }
             }
             return shape;
         };
-        const RasterPoint triangle[3] = {quad[0], quad[1], quad[2]};
-        EXPECT_EQ(Positions(Emitted([&] { CRasterizer::FillTriangleInside(window, triangle); })),
+        EXPECT_EQ(walked([&](auto add) {
+                      walk.ClipTriangle({quad[0], quad[1], quad[2]}, add);
+                  }),
                   inside(Triangle(quad[0], quad[1], quad[2])));
-        EXPECT_EQ(
-            Positions(Emitted([&] { CRasterizer::FillCircleInside(window, quad[0], i % 20); })),
-            inside(Emitted([&] { CRasterizer::FillCircle(quad[0].x, quad[0].y, i % 20); })));
+        EXPECT_EQ(walked([&](auto add) { walk.ClipCircle(quad[0], i % 20, add); }),
+                  inside(Emitted([&] { CRasterizer::FillCircle(quad[0].x, quad[0].y, i % 20); })));
     }
 }
 
 TEST(Rasterizer, DistanceCostsNothing) {
     // Spans are counted, not timed: a frame's worth of them, however far the corners are.
     constexpr int kFar = 1 << 30;
-    const RasterWindow window = {0, 0, 99, 49};
+    const PixelBox window = {0, 0, 100, 50};
     const RasterPoint quads[][4] = {
         {{-kFar, -kFar}, {kFar, -kFar}, {kFar, kFar}, {-kFar, kFar}},
         {{-kFar, -kFar}, {kFar, kFar - 1}, {kFar, kFar}, {-kFar, -kFar + 7}},
@@ -361,7 +369,7 @@ TEST(Rasterizer, RowsBeyondTheWindowCostItsWidthTogether) {
                 return RasterPoint{p.x, p.y * turn};
             });
             int64_t pixels = 0;
-            CWindowWalk({0, 0, width - 1, 0}).ClampQuad(quad, [&](int, int first, int last) {
+            CWindowWalk({0, 0, width, 1}).ClampQuad(quad, [&](int, int first, int last) {
                 pixels += last - first + 1;
             });
             EXPECT_GE(pixels, width);
@@ -436,7 +444,6 @@ TEST(SpanRows, MergeAndCombineAsSetsOfColumnsDo) {
                 expected[y].insert(x);
             }
         }
-        spans.Finish();
         PixelBox bounds = {};
         Runs combined;
         for (int y = 0; y < kRows; ++y) {
@@ -461,7 +468,7 @@ TEST(SpanRows, MergeAndCombineAsSetsOfColumnsDo) {
     }
 }
 
-TEST(Coverage, KeepsBitsAndTellsOfChanges) {
+TEST(Coverage, KeepsRunsAndTellsOfChanges) {
     std::mt19937 random(10);
     CCoverage coverage;
     for (int round = 0; round < 60; ++round) {
@@ -479,10 +486,13 @@ TEST(Coverage, KeepsBitsAndTellsOfChanges) {
             pixel = (&pixel - pixels.data()) / 37 % 2 ? 0xFF000000 : 0x00FFFFFF;
             pixel = rare ? static_cast<uint32_t>(random()) & 0x80FFFFFF : pixel;
         }
-        coverage.Begin(width, 4, box);
+        coverage.Begin(4, box);
         take(1);
         take(2);
-        Runs runs, expected;
+        const auto row = [&](int y) {
+            return Runs(coverage.Row(y).begin(), coverage.Row(y).end());
+        };
+        Runs expected;
         for (int x = box.left; x < box.right; ++x) {
             if (pixels[static_cast<size_t>(x)] >> 24) {
                 if (expected.empty() || expected.back().end != x) {
@@ -492,15 +502,14 @@ TEST(Coverage, KeepsBitsAndTellsOfChanges) {
             }
         }
         for (const int y : {1, 2}) {
-            coverage.GetRuns(y, runs);
-            ASSERT_EQ(runs, expected) << width << " wide, from " << box.left << " to " << box.right;
+            ASSERT_EQ(row(y), expected)
+                << width << " wide, from " << box.left << " to " << box.right;
         }
         for (const int y : {-1, 0, 3, 4}) {
-            coverage.GetRuns(y, runs);
-            EXPECT_TRUE(runs.empty());
+            EXPECT_TRUE(row(y).empty());
         }
         const uint64_t serial = coverage.Serial();
-        coverage.Begin(width, 4, box);
+        coverage.Begin(4, box);
         take(1);
         EXPECT_EQ(coverage.LastChanged(), -1);
         EXPECT_EQ(coverage.Serial(), serial);
@@ -510,7 +519,7 @@ TEST(Coverage, KeepsBitsAndTellsOfChanges) {
         const bool changed = expected.empty() || expected.back().end != box.right;
         EXPECT_EQ(coverage.LastChanged(), changed ? 2 : -1);
         EXPECT_EQ(coverage.Serial() != serial, changed);
-        coverage.Begin(width, 5, box);
+        coverage.Begin(5, box);
         EXPECT_NE(coverage.Serial(), serial);
     }
 }

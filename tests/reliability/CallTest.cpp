@@ -103,7 +103,7 @@ TEST_P(Calls, OfManyLivesLeaveNothing) {
     }
 }
 
-// Twelve effects, and free-form three times at least, since its instances share a lock.
+// Every effect, and free-form with each of them: it keeps most from frame to frame.
 TEST(Calls, OnManyThreadsGiveWhatEachGivesAlone) {
     std::vector<Scene> scenes;
     for (const uint32_t seed : Seeds(2, 40)) {
