@@ -3,7 +3,6 @@
 #include <cmath>
 #include <cstring>
 #include <random>
-#include <thread>
 #include <vector>
 
 #include <gmock/gmock.h>
@@ -371,27 +370,6 @@ TEST(FreeformPiP, CheckerboardShowsTheMap) {
         }
         pip.SetMapMode(1);
         EXPECT_EQ(pip.RenderCheckerboard(destination), 0);
-    }
-}
-
-TEST(FreeformPiP, InstancesOnSeveralThreadsDrawTheirOwnPictures) {
-    std::vector<std::thread> threads;
-    for (uint32_t seed = 0; seed < 4; ++seed) {
-        threads.emplace_back([seed] {
-            const int size = 20 + static_cast<int>(seed) * 7;
-            const Scene scene = {
-                size, size, 30, 30, {{1, 2}, {size, 3}, {size - 4, size}, {0, 17}}};
-            Pixels source = RandomPixels(900, seed);
-            const Pixels expected = Draw(scene, source, 3);
-            for (int round = 0; round < 30; ++round) {
-                EXPECT_EQ(round % 3 ? Draw(scene, source, 0)
-                                    : DrawRows(scene, source, 5, 0x11223344),
-                          expected);
-            }
-        });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
     }
 }
 

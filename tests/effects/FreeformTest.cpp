@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
+#include <functional>
 #include <limits>
 #include <random>
-#include <thread>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -535,200 +535,76 @@ TEST(Freeform, WithoutASecondInputTheBackgroundIsCopied) {
     EXPECT_EQ(instance.Render(output.data(), background.data(), background.data()), KYV_FAIL);
 }
 
-TEST(Freeform, TheOutputMayBeEitherInput) {
-    std::mt19937 random(5);
-    for (const int32_t level : {0, 5}) {
-        const Params params = RandomParams(random, 0.5F);
-        const Frame background = RandomFrame(60 * 40, 1), foreground = RandomFrame(60 * 40, 2);
-        const Frame expected = RenderEffect(params, background, foreground, 60, 40, 0, level);
-        for (const bool first : {true, false}) {
-            CTestInstance instance(Pip(), 60, 40);
-            instance.Context().cpuLevel = level;
-            ASSERT_EQ(instance.Begin(), KYV_OK);
-            Store(params, instance);
-            Frame back = background, front = foreground;
-            Frame& output = first ? back : front;
-            EXPECT_EQ(instance.Render(output.data(), back.data(), front.data()), KYV_OK);
-            EXPECT_EQ(output, expected);
-        }
-    }
-}
-
-TEST(Freeform, ViewsAndFieldsLeaveTheRestAlone) {
-    std::mt19937 random(6);
-    constexpr int kWidth = 50, kHeight = 31;
-    for (const uint32_t format : {0U, 1U}) {
-        const Params params = RandomParams(random, 0.5F);
-        const Frame background = RandomFrame(2 * kWidth * kHeight, 1);
-        const Frame foreground = RandomFrame(2 * kWidth * kHeight, 2);
-        const auto view = [&](const Frame& frame, uint32_t layout) {
-            Frame part;
-            for (int y = 0; y < kHeight; ++y) {
-                const auto from = frame.begin() + y * 2 * kWidth + (layout == 2 ? kWidth : 0);
-                part.insert(part.end(), from, from + kWidth);
-            }
-            return part;
-        };
-        for (const uint32_t layout : {1U, 2U}) {
-            const Frame whole = RenderEffect(params, view(background, layout),
-                                             view(foreground, layout), kWidth, kHeight, format, 0);
-            for (const uint32_t field : {0U, 1U, 2U}) {
-                for (const int32_t level : {0, 5}) {
-                    CTestInstance instance(Pip(), kWidth, kHeight);
-                    instance.Context().cpuLevel = level;
-                    instance.Context().pixelFormat = format;
-                    instance.Context().stereoLayout = layout;
-                    instance.Context().fieldSelector = field;
-                    ASSERT_EQ(instance.Begin(), KYV_OK);
-                    Store(params, instance);
-                    Frame output(background.size(), 7);
-                    ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()),
-                              KYV_OK);
-                    Frame expected = output;
-                    for (int y = 0; y < kHeight; ++y) {
-                        const bool drawn = field == 0 || y % 2 == static_cast<int>(field) - 1;
-                        auto to = expected.begin() + y * 2 * kWidth;
-                        std::fill_n(to, 2 * kWidth, 7);
-                        if (drawn) {
-                            std::copy_n(whole.begin() + y * kWidth, kWidth,
-                                        to + (layout == 2 ? kWidth : 0));
-                        }
-                    }
-                    ASSERT_EQ(output, expected) << layout << ' ' << field << ' ' << level;
-                }
-            }
-        }
-    }
-}
-
-// What an instance has drawn before must not show.
-TEST(Freeform, FramesDoNotDependOnThoseBefore) {
-    std::mt19937 random(7);
-    for (int round = 0; round < 6; ++round) {
-        CTestInstance instance(Pip(), 1, 1);
-        ASSERT_EQ(instance.Begin(), KYV_OK);
-        Params params = RandomParams(random, 0.5F);
-        for (int i = 0; i < 25; ++i) {
-            const int width = 30 + static_cast<int>(random() % 3) * 25;
-            const int height = 20 + static_cast<int>(random() % 2) * 30;
-            if (random() % 3 == 0) {
-                params = RandomParams(random, 0.6F);
-            }
-            EffectContext& context = instance.Context();
-            context.width = static_cast<uint32_t>(width);
-            context.height = static_cast<uint32_t>(height);
-            context.pixelFormat = random() % 4 == 0;
-            context.cpuLevel = static_cast<int32_t>(random() % 6);
-            Store(params, instance);
-            const auto pixels = static_cast<size_t>(width * height);
-            const Frame background = RandomFrame(pixels, static_cast<uint32_t>(i));
-            const Frame foreground = RandomFrame(pixels, static_cast<uint32_t>(i) + 50);
-            Frame output(pixels);
-            ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()), KYV_OK);
-            ASSERT_EQ(output, RenderEffect(params, background, foreground, width, height,
-                                           context.pixelFormat, 5))
-                << "round " << round << " frame " << i;
-            if (i == 12) {
-                EXPECT_EQ(instance.End(), KYV_OK);
-                EXPECT_EQ(instance.End(), KYV_OK); // and the next frame works all the same
-            }
-        }
-    }
-}
-
-// One thing changes from frame to frame, or nothing: a parameter, or a few rows of the keyed
-// picture. A fresh instance tells what each frame must be.
+// One thing changes from frame to frame, or nothing: a parameter, a few rows of the keyed picture,
+// the level, the frame. A fresh instance tells what each frame must be.
 TEST(Freeform, WhatIsKeptIsOutdatedByEveryChange) {
     std::mt19937 random(11);
-    constexpr int kWidth = 96, kHeight = 70;
-    const Frame background = RandomFrame(kWidth * kHeight, 1);
     for (int round = 0; round < 12; ++round) {
-        CTestInstance instance(Pip(), kWidth, kHeight);
-        const uint32_t format = static_cast<uint32_t>(round) % 2;
-        instance.Context().pixelFormat = format;
+        CTestInstance instance(Pip(), 96, 70);
+        EffectContext& context = instance.Context();
+        context.pixelFormat = static_cast<uint32_t>(round) % 2;
         ASSERT_EQ(instance.Begin(), KYV_OK);
-        Params params = RandomParams(random, 0.4F);
+        int width = 96, height = 70;
+        Params params = RandomParams(random, 0.4F), other;
         params.picture = params.border = params.shadow = params.key = 1;
         params.pictureBlur = params.borderBlur = params.shadowBlur = round % 4;
-        Frame foreground = PatchedFrame(kWidth, kHeight, 2, params.keyColor);
-        for (int i = 0; i < 40; ++i) {
-            const Params other = RandomParams(random, 0.4F);
-            switch (random() % 24) {
-            case 0:
-                std::copy(other.corners, other.corners + 8, params.corners);
-                break;
-            case 1:
-                params.keyColor = other.keyColor;
-                break;
-            case 2:
-                params.tolerance = other.tolerance;
-                break;
-            case 3:
-                params.key = other.key;
-                break;
-            case 4:
-                params.picture = other.picture;
-                break;
-            case 5:
-                params.pictureBlur = other.pictureBlur;
-                break;
-            case 6:
-                params.shadow = other.shadow;
-                break;
-            case 7:
-                params.shadowColors[random() % 2] = other.shadowColors[0];
-                break;
-            case 8:
-                params.shadowType = other.shadowType;
-                break;
-            case 9:
-                params.shadowBlur = other.shadowBlur;
-                break;
-            case 10:
-                params.offset[random() % 2] = other.offset[0];
-                break;
-            case 11:
-                params.border = other.border;
-                break;
-            case 12:
-                params.borderSize = other.borderSize;
-                break;
-            case 13:
-                params.borderColors[random() % 2] = other.borderColors[0];
-                break;
-            case 14:
-                params.borderType = other.borderType;
-                break;
-            case 15:
-                params.borderBlur = other.borderBlur;
-                break;
-            case 16:
-                params.shadowAlpha = params.borderAlpha = params.pictureAlpha = other.shadowAlpha;
-                break;
-            case 17:
-            case 18:
-            case 19: { // a few rows: keyed away, or there again
-                const int y = static_cast<int>(random() % kHeight);
-                const uint32_t key = params.keyColor;
-                const uint32_t pixel = (key & 255) << 16 | (key & 0xFF00) | key >> 16;
-                const auto from = foreground.begin() + y * kWidth;
-                const int rows = std::min(1 + static_cast<int>(random() % 4), kHeight - y);
-                std::fill(from, from + rows * kWidth, random() % 2 ? pixel : ~pixel);
-                break;
-            }
-            case 20:
-                foreground = PatchedFrame(kWidth, kHeight, random(), params.keyColor);
-                break;
-            default:
-                break;
-            }
+        Frame background, foreground;
+        const auto anotherFrame = [&] {
+            context.width = static_cast<uint32_t>(width);
+            context.height = static_cast<uint32_t>(height);
+            background = RandomFrame(static_cast<size_t>(width * height), random());
+            foreground = PatchedFrame(width, height, random(), params.keyColor);
+        };
+        anotherFrame();
+        const auto keyRows = [&] { // keyed away, or there again
+            const int y = static_cast<int>(random() % static_cast<uint32_t>(height));
+            const uint32_t key = params.keyColor;
+            const uint32_t pixel = (key & 255) << 16 | (key & 0xFF00) | key >> 16;
+            const auto from = foreground.begin() + y * width;
+            const int rows = std::min(1 + static_cast<int>(random() % 4), height - y);
+            std::fill(from, from + rows * width, random() % 2 ? pixel : ~pixel);
+        };
+        const std::function<void()> changes[] = {
+            [&] { std::copy(other.corners, other.corners + 8, params.corners); },
+            [&] { params.keyColor = other.keyColor; },
+            [&] { params.tolerance = other.tolerance; },
+            [&] { params.key = other.key; },
+            [&] { params.picture = other.picture; },
+            [&] { params.pictureBlur = other.pictureBlur; },
+            [&] { params.shadow = other.shadow; },
+            [&] { params.shadowColors[random() % 2] = other.shadowColors[0]; },
+            [&] { params.shadowType = other.shadowType; },
+            [&] { params.shadowBlur = other.shadowBlur; },
+            [&] { params.offset[random() % 2] = other.offset[0]; },
+            [&] { params.border = other.border; },
+            [&] { params.borderSize = other.borderSize; },
+            [&] { params.borderColors[random() % 2] = other.borderColors[0]; },
+            [&] { params.borderType = other.borderType; },
+            [&] { params.borderBlur = other.borderBlur; },
+            [&] {
+                params.shadowAlpha = params.borderAlpha = params.pictureAlpha = other.tolerance;
+            },
+            keyRows,
+            keyRows,
+            keyRows,
+            [&] { foreground = PatchedFrame(width, height, random(), params.keyColor); },
+            [&] { context.pixelFormat ^= 1; },
+            [&] { width = 96 + 25 - width % 96, anotherFrame(); },
+            [&] { height = 70 + 33 - height % 70, anotherFrame(); },
+            [&] { EXPECT_EQ(instance.End(), KYV_OK); }, // and the next frame works all the same
+            [] {},
+            [] {},
+        };
+        for (int i = 0; i < 50; ++i) {
+            other = RandomParams(random, 0.4F);
+            changes[random() % std::size(changes)]();
             Store(params, instance);
             Frame output(background.size());
             ASSERT_EQ(instance.Render(output.data(), background.data(), foreground.data()), KYV_OK);
-            ASSERT_EQ(output, RenderEffect(params, background, foreground, kWidth, kHeight, format,
-                                           instance.Context().cpuLevel))
+            ASSERT_EQ(output, RenderEffect(params, background, foreground, width, height,
+                                           context.pixelFormat, context.cpuLevel))
                 << "round " << round << " frame " << i;
-            instance.Context().cpuLevel = static_cast<int32_t>(random() % 6);
+            context.cpuLevel = static_cast<int32_t>(random() % 6);
         }
     }
 }
@@ -899,26 +775,6 @@ TEST(Freeform, FramesBeyondTheBoxAreDrawnUpToItsEnd) {
                         RenderEffect(blurred, background, foreground, width, height, 0, level))
                 << width << " wide, blurred, level " << level;
         }
-    }
-}
-
-TEST(Freeform, InstancesOnSeveralThreadsAreIndependent) {
-    std::vector<std::thread> threads;
-    for (uint32_t seed = 0; seed < 4; ++seed) {
-        threads.emplace_back([seed] {
-            std::mt19937 random(seed);
-            const int size = 24 + static_cast<int>(seed) * 9;
-            const auto pixels = static_cast<size_t>(size * size);
-            const Frame background = RandomFrame(pixels, 1), foreground = RandomFrame(pixels, 2);
-            for (int round = 0; round < 8; ++round) {
-                const Params params = RandomParams(random, 0.5F);
-                EXPECT_EQ(RenderEffect(params, background, foreground, size, size, 0, 0),
-                          RenderEffect(params, background, foreground, size, size, 0, 5));
-            }
-        });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
     }
 }
 

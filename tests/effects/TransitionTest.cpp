@@ -9,7 +9,6 @@
 #include "imageutility/Bitmap.h"
 #include "imageutility/Conversion.h"
 #include "platform/Library.h"
-#include "tests/platform/ProcessUse.h"
 #include "tests/support/TestHost.h"
 
 namespace {
@@ -430,31 +429,6 @@ TEST_P(Transition, FramesOfOneColumnOrRowAreBlended) {
         Apply(instance, {.percentage = 1.0F});
         EXPECT_EQ(RenderFrame(instance, a, b), b);
     }
-}
-
-TEST(MaskTransition, ManyInstancesLeaveNothingBehind) {
-    constexpr uint32_t kWidth = 160, kHeight = 120;
-    const Frame a = RandomFrame(kWidth * kHeight, 15), b = RandomFrame(kWidth * kHeight, 16);
-    Frame output(a.size());
-    const auto live = [&](int count) {
-        for (int i = 0; i < count; ++i) {
-            CTestInstance instance(Effect(i % 2 ? kTest : kAlpha), kWidth, kHeight);
-            instance.Context().threadCount = 2;
-            instance.Context().cpuLevel = 5;
-            ASSERT_EQ(instance.Begin(), KYV_OK);
-            ASSERT_EQ(instance.Render(output.data(), a.data(), b.data()), KYV_OK);
-            if (i % 4 < 2) { // the other half is released by DestroyInstance alone
-                ASSERT_EQ(instance.End(), KYV_OK);
-            }
-        }
-    };
-    live(20); // what the process keeps for good
-    const ProcessUse before = GetProcessUse();
-    live(KYV_INSTANCES);
-    const ProcessUse after = GetProcessUse();
-    EXPECT_LE(after.threads, before.threads);
-    EXPECT_LE(after.handles, before.handles);
-    EXPECT_LT(after.memoryBytes - before.memoryBytes, after.noiseBytes);
 }
 
 } // namespace

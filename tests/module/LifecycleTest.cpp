@@ -1,8 +1,5 @@
 // The calling protocol, for all effects alike.
-#include <algorithm>
 #include <array>
-#include <random>
-#include <thread>
 
 #include <gtest/gtest.h>
 
@@ -141,54 +138,6 @@ TEST_P(Lifecycle, RequestFlagsAreSetByTheEffectsThatNeedThem) {
               color || sprites || id == "Kyv_Dsp_Vi_LightRay" ? 1U : 0U);
 }
 
-// Calls in random order on frames with guards: nothing crashes, nothing is written outside the
-// frame, no status but the known ones comes back.
-TEST_P(Lifecycle, SurvivesAnyOrderOfCalls) {
-    constexpr uint32_t kGuard = 0xDEADBEEF;
-    constexpr size_t kGuardPixels = 64;
-    std::mt19937 random(GetParam());
-    for (int round = 0; round < 10; ++round) {
-        const uint32_t width = 1 + random() % 40;
-        const uint32_t height = 1 + random() % 20;
-        const size_t pixels = size_t{2} * width * height;
-        const Frame input = RandomFrame(pixels, random());
-        Frame output(pixels + 2 * kGuardPixels, kGuard);
-        CTestInstance instance(effect(), width, height);
-        EffectContext& context = instance.Context();
-        for (int call = 0; call < 20; ++call) {
-            context.pixelFormat = random() % 3;
-            context.stereoLayout = random() % 4;
-            context.fieldSelector = random() % 4;
-            context.cpuLevel = static_cast<int32_t>(random() % 7) - 1;
-            context.position = static_cast<int64_t>(random() % 100) * 1000000;
-            context.duration = static_cast<int64_t>(random() % 3) * 50000000;
-            context.threadCount = random() % 4;
-            KyvStatus status = 0;
-            switch (random() % 6) {
-            case 0:
-                status = instance.Begin();
-                break;
-            case 1:
-                status = instance.End();
-                break;
-            case 2:
-                status = instance.Process(random() % 4 ? &output[kGuardPixels] : nullptr);
-                break;
-            case 3:
-                status = instance.SetInput(random() % 3, random() % 4 ? input.data() : nullptr);
-                break;
-            default:
-                status = instance.Render(&output[kGuardPixels], input.data(), input.data());
-                break;
-            }
-            EXPECT_TRUE(status == KYV_OK || status == KYV_FAIL) << std::hex << status;
-        }
-        const auto guarded = [](uint32_t pixel) { return pixel == kGuard; };
-        EXPECT_TRUE(std::all_of(output.begin(), output.begin() + kGuardPixels, guarded));
-        EXPECT_TRUE(std::all_of(output.end() - kGuardPixels, output.end(), guarded));
-    }
-}
-
 TEST_P(Lifecycle, AbsurdFrameSizesAreRefused) {
     const Frame input(16);
     Frame output(16, 3);
@@ -199,37 +148,6 @@ TEST_P(Lifecycle, AbsurdFrameSizesAreRefused) {
         instance.Render(output.data(), input.data(), input.data());
         EXPECT_EQ(output, Frame(16, 3)) << width << " x " << height;
     }
-}
-
-TEST_P(Lifecycle, InstancesOnTwoThreadsGiveWhatEachGivesAlone) {
-    const auto render = [this](uint32_t seed) {
-        Frame all;
-        CTestInstance instance(effect(), 70, 50);
-        instance.Context().cpuLevel = 5;
-        instance.Context().threadCount = 2;
-        instance.Context().duration = 200000000;
-        instance.Context().randomSeed = seed;
-        EXPECT_EQ(instance.Begin(), KYV_OK);
-        if (effect().params[0].type == ParamType_Float) {
-            instance.Set(effect().params[0].key, 0.1F * static_cast<float>(seed));
-        }
-        for (const int64_t seconds : {0, 4, 2, 9, 8}) {
-            instance.Context().position = seconds * 10000000;
-            const Frame input = RandomFrame(70 * 50, seed + static_cast<uint32_t>(seconds));
-            Frame output(input.size());
-            EXPECT_EQ(instance.Render(output.data(), input.data(), input.data()), KYV_OK);
-            all.insert(all.end(), output.begin(), output.end());
-        }
-        return all;
-    };
-    const Frame alone[2] = {render(1), render(9)};
-    Frame together[2];
-    std::thread first([&] { together[0] = render(1); });
-    std::thread second([&] { together[1] = render(9); });
-    first.join();
-    second.join();
-    EXPECT_EQ(together[0], alone[0]);
-    EXPECT_EQ(together[1], alone[1]);
 }
 
 } // namespace
