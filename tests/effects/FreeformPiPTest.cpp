@@ -337,8 +337,17 @@ TEST(FreeformPiP, OnlyChangesRebuildTheMap) {
         EXPECT_EQ(pip.SourceMap(), nullptr);
         makesDirty([&] { pip.SetMapMode(2); });
         EXPECT_NE(pip.SourceMap(), nullptr);
+    }
+}
 
-        // Another size is another map; the wrong images draw nothing.
+TEST(FreeformPiP, AnotherSizeIsAnotherMapAndTheWrongImagesDrawNothing) {
+    for (const int level : {0, 5}) {
+        CFreeformPiP pip;
+        Pixels source = RandomPixels(40 * 30, 5), frame(40 * 30);
+        CImageARGB destination = View(frame, 40, level);
+        const CImageARGB picture = View(source, 40, level);
+        Apply({40, 30, 40, 30, {{5, 5}, {30, 6}, {33, 25}, {4, 24}}}, pip);
+        ASSERT_EQ(pip.Render(picture, destination), 1);
         pip.SetSize(40, 30, 20, 60);
         EXPECT_TRUE(pip.IsDirty());
         EXPECT_EQ(pip.Render(picture, destination), 0);

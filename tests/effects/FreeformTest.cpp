@@ -129,21 +129,10 @@ public:
             Gradient(border, wide, m_p.borderType, m_p.borderColors);
         }
         if (m_p.shadow) {
-            const auto stamp = [&](const Frame& layer) {
-                for (int y = 0; y < m_height; ++y) {
-                    for (int x = 0; x < m_width; ++x) {
-                        const int tx = x + dx, ty = y + dy;
-                        if (layer[At(x, y)] >> 24 && tx >= 0 && ty >= 0 && tx < m_width &&
-                            ty < m_height) {
-                            shadow[At(tx, ty)] = 0xFF000000 | Color(m_p.shadowColors[0]);
-                        }
-                    }
-                }
-            };
             if (m_p.picture) {
-                stamp(picture);
+                Stamp(picture, dx, dy, shadow);
             }
-            stamp(border);
+            Stamp(border, dx, dy, shadow);
             Gradient(shadow, {wide.left + dx, wide.top + dy, wide.right + dx, wide.bottom + dy},
                      m_p.shadowType, m_p.shadowColors);
             blur(shadow, m_p.shadowBlur);
@@ -152,26 +141,14 @@ public:
         blur(picture, m_p.pictureBlur);
 
         Frame output = background;
-        const auto blend = [&](const Frame& layer, uint32_t opacity) {
-            for (size_t i = 0; i < output.size(); ++i) {
-                const uint32_t a = layer[i] >> 24;
-                const uint32_t w = opacity < 255 ? ((opacity + 1) * a) >> 8 : a;
-                uint32_t pixel = output[i] & 0xFF000000;
-                for (int shift = 0; shift < 24; shift += 8) {
-                    const uint32_t s = layer[i] >> shift & 255, d = output[i] >> shift & 255;
-                    pixel |= (s * w + d * (256 - w)) >> 8 << shift;
-                }
-                output[i] = pixel;
-            }
-        };
         if (m_p.shadow) {
-            blend(shadow, m_p.shadowAlpha);
+            Blend(shadow, m_p.shadowAlpha, output);
         }
         if (m_p.border) {
-            blend(border, m_p.borderAlpha);
+            Blend(border, m_p.borderAlpha, output);
         }
         if (m_p.picture) {
-            blend(picture, m_p.pictureAlpha);
+            Blend(picture, m_p.pictureAlpha, output);
         }
         return output;
     }
@@ -179,6 +156,31 @@ public:
 private:
     size_t At(int x, int y) const { return static_cast<size_t>(y * m_width + x); }
     uint32_t Black() const { return m_ayuv ? 0x00108080 : 0; } // transparent
+
+    // Where a layer is, (dx, dy) from there the shadow is too.
+    void Stamp(const Frame& layer, int dx, int dy, Frame& shadow) const {
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = 0; x < m_width; ++x) {
+                const int tx = x + dx, ty = y + dy;
+                if (layer[At(x, y)] >> 24 && tx >= 0 && ty >= 0 && tx < m_width && ty < m_height) {
+                    shadow[At(tx, ty)] = 0xFF000000 | Color(m_p.shadowColors[0]);
+                }
+            }
+        }
+    }
+
+    static void Blend(const Frame& layer, uint32_t opacity, Frame& output) {
+        for (size_t i = 0; i < output.size(); ++i) {
+            const uint32_t a = layer[i] >> 24;
+            const uint32_t w = opacity < 255 ? ((opacity + 1) * a) >> 8 : a;
+            uint32_t pixel = output[i] & 0xFF000000;
+            for (int shift = 0; shift < 24; shift += 8) {
+                const uint32_t s = layer[i] >> shift & 255, d = output[i] >> shift & 255;
+                pixel |= (s * w + d * (256 - w)) >> 8 << shift;
+            }
+            output[i] = pixel;
+        }
+    }
 
     // A parameter's colour as the low 24 bits of a pixel.
     uint32_t Color(uint32_t color) const {
@@ -535,6 +537,16 @@ TEST(Freeform, WithoutASecondInputTheBackgroundIsCopied) {
     EXPECT_EQ(instance.Render(output.data(), background.data(), background.data()), KYV_FAIL);
 }
 
+// Some rows of the picture are keyed away, or there again.
+void KeyRows(std::mt19937& random, uint32_t key, int width, Frame& foreground) {
+    const int height = static_cast<int>(foreground.size()) / width;
+    const int y = static_cast<int>(random() % static_cast<uint32_t>(height));
+    const uint32_t pixel = (key & 255) << 16 | (key & 0xFF00) | key >> 16;
+    const auto from = foreground.begin() + y * width;
+    const int rows = std::min(1 + static_cast<int>(random() % 4), height - y);
+    std::fill(from, from + rows * width, random() % 2 ? pixel : ~pixel);
+}
+
 // One thing changes from frame to frame, or nothing: a parameter, a few rows of the keyed picture,
 // the level, the frame. A fresh instance tells what each frame must be.
 TEST(Freeform, WhatIsKeptIsOutdatedByEveryChange) {
@@ -556,14 +568,7 @@ TEST(Freeform, WhatIsKeptIsOutdatedByEveryChange) {
             foreground = PatchedFrame(width, height, random(), params.keyColor);
         };
         anotherFrame();
-        const auto keyRows = [&] { // keyed away, or there again
-            const int y = static_cast<int>(random() % static_cast<uint32_t>(height));
-            const uint32_t key = params.keyColor;
-            const uint32_t pixel = (key & 255) << 16 | (key & 0xFF00) | key >> 16;
-            const auto from = foreground.begin() + y * width;
-            const int rows = std::min(1 + static_cast<int>(random() % 4), height - y);
-            std::fill(from, from + rows * width, random() % 2 ? pixel : ~pixel);
-        };
+        const auto keyRows = [&] { KeyRows(random, params.keyColor, width, foreground); };
         const std::function<void()> changes[] = {
             [&] { std::copy(other.corners, other.corners + 8, params.corners); },
             [&] { params.keyColor = other.keyColor; },

@@ -176,86 +176,104 @@ class Allocation : public testing::TestWithParam<const EffectDescriptor*> {};
 INSTANTIATE_TEST_SUITE_P(AllEffects, Allocation, testing::ValuesIn(AllEffects()),
                          [](const auto& entry) { return EffectName(*entry.param); });
 
-enum Phase { kBegin, kFirst, kSecond, kPhases };
-constexpr const char* kPhaseNames[kPhases] = {"BeginProcessing", "first frame", "second frame"};
+enum Phase { kBegin, kFirst, kSecond };
+constexpr const char* kPhaseNames[] = {"BeginProcessing", "first frame", "second frame"};
 
-TEST_P(Allocation, RefusedAtEveryPlaceGivesFailureOrTheRightBytes) {
-    for (const uint32_t seed : Seeds(2, 60)) {
-        // Everything but size, format and layout may change from frame to frame.
-        Scene scenes[2] = {RandomScene(*GetParam(), seed), RandomScene(*GetParam(), seed + 1000)};
-        for (Scene& scene : scenes) {
+// Two frames of one instance, and what they are when memory is there.
+class CTwoFrames {
+public:
+    CTwoFrames(const EffectDescriptor& effect, uint32_t seed)
+        : m_scenes{RandomScene(effect, seed), RandomScene(effect, seed + 1000)} {
+        for (Scene& scene : m_scenes) {
             scene.context.width += 2; // what is too small to be scaled needs less memory
             scene.context.height += 2;
             scene.context.fieldSelector = 0;
         }
-        const auto copy = [&](auto field) { scenes[1].context.*field = scenes[0].context.*field; };
+        // Everything but size, format and layout may change from frame to frame.
+        const auto copy = [&](auto field) {
+            m_scenes[1].context.*field = m_scenes[0].context.*field;
+        };
         copy(&EffectContext::width);
         copy(&EffectContext::height);
         copy(&EffectContext::pixelFormat);
         copy(&EffectContext::stereoLayout);
         copy(&EffectContext::displayAspectX);
         copy(&EffectContext::displayAspectY);
-        const Frame inputs[2] = {scenes[0].Input(0), scenes[0].Input(1)};
-        Frame output(scenes[0].FramePixels());
-        const auto render = [&](CSceneInstance& instance, const Scene& scene) {
-            instance.Apply(scene);
-            std::fill(output.begin(), output.end(), 0xA5A5A5A5);
-            return instance.Render(output.data(), inputs[0].data(), inputs[1].data());
-        };
-        Frame expected[2];
+        m_inputs[0] = m_scenes[0].Input(0);
+        m_inputs[1] = m_scenes[0].Input(1);
+        m_output.resize(m_scenes[0].FramePixels());
         for (int frame = 0; frame < 2; ++frame) {
-            CSceneInstance instance(scenes[0]);
-            ASSERT_EQ(instance.Begin(), KYV_OK);
+            CSceneInstance instance(m_scenes[0]);
+            EXPECT_EQ(instance.Begin(), KYV_OK);
             for (int i = 0; i <= frame; ++i) {
-                ASSERT_EQ(render(instance, scenes[i]), KYV_OK);
+                EXPECT_EQ(Render(instance, i), KYV_OK);
             }
-            expected[frame] = output;
+            m_expected[frame] = m_output;
         }
-        for (int phase = kBegin; phase < kPhases; ++phase) {
-            Repeat([&](const Refusal& refusal) {
-                const auto fail = [&](const char* what) {
-                    FAIL() << what << ": " << kPhaseNames[phase] << ", request " << refusal.first
-                           << (refusal.all ? " and all that follow" : "") << "; " << scenes[0];
-                };
-                bool reached = false;
-                [&] {
-                    CSceneInstance instance(scenes[0]);
-                    KyvStatus status = KYV_OK;
-                    if (phase == kBegin) {
-                        reached = RunRefused(refusal, [&] { status = instance.Begin(); });
-                        if (status != KYV_OK && status != KYV_FAIL) {
-                            return fail("unknown status");
-                        }
-                        if (status == KYV_FAIL && instance.Begin() != KYV_OK) {
-                            return fail("BeginProcessing does not recover");
-                        }
-                    } else if (instance.Begin() != KYV_OK) {
-                        return fail("BeginProcessing");
-                    }
-                    for (int frame = 0; frame < 2; ++frame) {
-                        if (phase == frame + kFirst) {
-                            reached = RunRefused(refusal,
-                                                 [&] { status = render(instance, scenes[frame]); });
-                            if (status != KYV_OK && status != KYV_FAIL) {
-                                return fail("unknown status");
-                            }
-                            if (status == KYV_OK && output != expected[frame]) {
-                                return fail("success with other bytes");
-                            }
-                        }
-                        if (render(instance, scenes[frame]) != KYV_OK) {
-                            return fail("ProcessFrame does not recover");
-                        }
-                        if (output != expected[frame]) {
-                            return fail("other bytes after the failure");
-                        }
-                    }
-                }();
-                return reached;
-            });
-            if (HasFatalFailure()) {
-                return;
+    }
+
+    const Scene& First() const { return m_scenes[0]; }
+
+    // Null, or what went wrong when memory is refused in the phase; reached tells whether it was.
+    const char* Play(Phase phase, const Refusal& refusal, bool& reached) {
+        CSceneInstance instance(m_scenes[0]);
+        KyvStatus status = KYV_OK;
+        if (phase == kBegin) {
+            reached = RunRefused(refusal, [&] { status = instance.Begin(); });
+            if (status != KYV_OK && status != KYV_FAIL) {
+                return "unknown status";
             }
+            if (status == KYV_FAIL && instance.Begin() != KYV_OK) {
+                return "BeginProcessing does not recover";
+            }
+        } else if (instance.Begin() != KYV_OK) {
+            return "BeginProcessing";
+        }
+        for (int frame = 0; frame < 2; ++frame) {
+            if (phase == frame + kFirst) {
+                reached = RunRefused(refusal, [&] { status = Render(instance, frame); });
+                if (status != KYV_OK && status != KYV_FAIL) {
+                    return "unknown status";
+                }
+                if (status == KYV_OK && m_output != m_expected[frame]) {
+                    return "success with other bytes";
+                }
+            }
+            if (Render(instance, frame) != KYV_OK) {
+                return "ProcessFrame does not recover";
+            }
+            if (m_output != m_expected[frame]) {
+                return "other bytes after the failure";
+            }
+        }
+        return nullptr;
+    }
+
+private:
+    KyvStatus Render(CSceneInstance& instance, int frame) {
+        instance.Apply(m_scenes[frame]);
+        std::fill(m_output.begin(), m_output.end(), 0xA5A5A5A5);
+        return instance.Render(m_output.data(), m_inputs[0].data(), m_inputs[1].data());
+    }
+
+    Scene m_scenes[2];
+    Frame m_inputs[2], m_output, m_expected[2];
+};
+
+TEST_P(Allocation, RefusedAtEveryPlaceGivesFailureOrTheRightBytes) {
+    for (const uint32_t seed : Seeds(2, 60)) {
+        CTwoFrames frames(*GetParam(), seed);
+        for (const Phase phase : {kBegin, kFirst, kSecond}) {
+            Repeat([&](const Refusal& refusal) {
+                bool reached = false;
+                const char* const wrong = frames.Play(phase, refusal, reached);
+                if (wrong) {
+                    ADD_FAILURE() << wrong << ": " << kPhaseNames[phase] << ", request "
+                                  << refusal.first << (refusal.all ? " and all that follow" : "")
+                                  << "; " << frames.First();
+                }
+                return reached && !wrong;
+            });
         }
     }
 }

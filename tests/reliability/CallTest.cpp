@@ -20,6 +20,24 @@ class Calls : public testing::TestWithParam<const EffectDescriptor*> {};
 INSTANTIATE_TEST_SUITE_P(AllEffects, Calls, testing::ValuesIn(AllEffects()),
                          [](const auto& entry) { return EffectName(*entry.param); });
 
+KyvStatus AnyCall(const EffectCallbacks& callbacks, EffectContext& context, Random& random) {
+    switch (random() % 8) {
+    case 0:
+        return callbacks.BeginProcessing(&context);
+    case 1:
+        return callbacks.EndProcessing(&context);
+    case 2:
+        return callbacks.DestroyInstance(&context);
+    case 3:
+        return callbacks.InitInstance(&context);
+    case 4:
+    case 5:
+        return callbacks.SetInputFrame(static_cast<uint32_t>(random() % 3), &context);
+    default:
+        return callbacks.ProcessFrame(&context);
+    }
+}
+
 // Twenty calls, most of them out of turn, with a size, format and layout of their own each, and now
 // and then without something that a call needs.
 TEST_P(Calls, InRandomOrderReturnAStatusAndStayInTheFrame) {
@@ -51,29 +69,7 @@ TEST_P(Calls, InRandomOrderReturnAStatusAndStayInTheFrame) {
                                   (context.stereoLayout == 1 || context.stereoLayout == 2 ? 2 : 1);
             frames.push_back(std::make_unique<CGuardedMemory>(pixels * 4, random() % 16));
             context.frame = one(8) ? nullptr : frames.back()->Data();
-            const EffectCallbacks& callbacks = GetParam()->callbacks;
-            KyvStatus status = KYV_OK;
-            switch (random() % 8) {
-            case 0:
-                status = callbacks.BeginProcessing(&context);
-                break;
-            case 1:
-                status = callbacks.EndProcessing(&context);
-                break;
-            case 2:
-                status = callbacks.DestroyInstance(&context);
-                break;
-            case 3:
-                status = callbacks.InitInstance(&context);
-                break;
-            case 4:
-            case 5:
-                status = callbacks.SetInputFrame(static_cast<uint32_t>(random() % 3), &context);
-                break;
-            default:
-                status = callbacks.ProcessFrame(&context);
-                break;
-            }
+            const KyvStatus status = AnyCall(GetParam()->callbacks, context, random);
             ASSERT_TRUE(status == KYV_OK || status == KYV_FAIL) << "run " << seed;
             context.params = whole.params;
             context.descriptor = whole.descriptor;

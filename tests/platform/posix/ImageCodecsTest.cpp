@@ -254,15 +254,11 @@ struct TiffTags {
     uint16_t compression = COMPRESSION_NONE;
 };
 
-constexpr int kTiffWidth = 20; // more than a tile of 16
+constexpr int kTiffTile = 16;
+constexpr int kTiffWidth = 20; // more than a tile
 constexpr int kTiffHeight = 3;
 
-// Writes through the library's file interface; the samples of a pixel are sample(x, y, index).
-template <class Sample>
-Bytes Tiff(const TiffTags& tags, Sample sample) {
-    const kyvtest::CTempFolder folder;
-    TIFF* tiff = TIFFOpen(folder.Narrow("a.tif").c_str(), "w");
-    EXPECT_NE(tiff, nullptr);
+void SetTags(TIFF* tiff, const TiffTags& tags) {
     TIFFSetField(tiff, TIFFTAG_IMAGEWIDTH, kTiffWidth);
     TIFFSetField(tiff, TIFFTAG_IMAGELENGTH, kTiffHeight);
     TIFFSetField(tiff, TIFFTAG_SAMPLESPERPIXEL, tags.samples);
@@ -284,13 +280,21 @@ Bytes Tiff(const TiffTags& tags, Sample sample) {
         }
         TIFFSetField(tiff, TIFFTAG_COLORMAP, red.data(), green.data(), blue.data());
     }
-    const int side = 16;
     if (tags.isTiled) {
-        TIFFSetField(tiff, TIFFTAG_TILEWIDTH, side);
-        TIFFSetField(tiff, TIFFTAG_TILELENGTH, side);
+        TIFFSetField(tiff, TIFFTAG_TILEWIDTH, kTiffTile);
+        TIFFSetField(tiff, TIFFTAG_TILELENGTH, kTiffTile);
     } else {
         TIFFSetField(tiff, TIFFTAG_ROWSPERSTRIP, 2);
     }
+}
+
+// Writes through the library's file interface; the samples of a pixel are sample(x, y, index).
+template <class Sample>
+Bytes Tiff(const TiffTags& tags, Sample sample) {
+    const kyvtest::CTempFolder folder;
+    TIFF* tiff = TIFFOpen(folder.Narrow("a.tif").c_str(), "w");
+    EXPECT_NE(tiff, nullptr);
+    SetTags(tiff, tags);
     const bool isSeparate = tags.planar == PLANARCONFIG_SEPARATE;
     for (uint16_t plane = 0; plane < (isSeparate ? int{tags.samples} : 1); ++plane) {
         const auto run = [&](int left, int count, int y) {
@@ -303,10 +307,10 @@ Bytes Tiff(const TiffTags& tags, Sample sample) {
             return bytes;
         };
         if (tags.isTiled) {
-            for (int left = 0; left < kTiffWidth; left += side) {
+            for (int left = 0; left < kTiffWidth; left += kTiffTile) {
                 Bytes tile;
-                for (int y = 0; y < side; ++y) {
-                    tile = Joined(tile, run(left, side, y));
+                for (int y = 0; y < kTiffTile; ++y) {
+                    tile = Joined(tile, run(left, kTiffTile, y));
                 }
                 EXPECT_GE(
                     TIFFWriteTile(tiff, tile.data(), static_cast<uint32_t>(left), 0, 0, plane), 0);
