@@ -105,6 +105,23 @@ Size ParseSize(std::string_view what, std::string_view text) {
     return ParsePair(what, text, 'x', 32768, "a size, such as 1920x1080, up to 32768x32768");
 }
 
+size_t ParseWord(std::string_view what, std::string_view text,
+                 const std::vector<std::string>& words) {
+    for (size_t i = 0; i < words.size(); ++i) {
+        if (words[i] == text) {
+            return i;
+        }
+    }
+    Refuse(what, text, "one of " + Join(words, ", "));
+}
+
+std::filesystem::path ParsePath(std::string_view what, std::string_view text) {
+    if (text.empty()) {
+        throw CUsageError(std::string(what) + " is empty: name a file");
+    }
+    return PathOf(text);
+}
+
 std::vector<std::string> SplitWords(std::string_view what, std::string_view text) {
     std::vector<std::string> words;
     bool inWord = false;

@@ -1,12 +1,16 @@
 // Numbers, times and ratios on the command line. All throw CUsageError; what names the option.
 #pragma once
 
+#include <charconv>
 #include <cstdint>
+#include <filesystem>
 #include <string>
 #include <string_view>
 #include <vector>
 
 #include "host/Rational.h"
+#include "hosting/Error.h"
+#include "hosting/Text.h"
 
 namespace kyvhost {
 
@@ -29,5 +33,31 @@ std::vector<std::string> SplitWords(std::string_view what, std::string_view text
 
 // "1920x1080"
 Size ParseSize(std::string_view what, std::string_view text);
+
+// One of a few words; the value is the place in the list.
+size_t ParseWord(std::string_view what, std::string_view text,
+                 const std::vector<std::string>& words);
+
+// Any text but none.
+std::filesystem::path ParsePath(std::string_view what, std::string_view text);
+
+// A whole number from least to most.
+template <class T>
+T ParseWhole(std::string_view what, std::string_view text, T least, T most) {
+    using kyvhosting::CUsageError;
+    T number = 0;
+    const char* const end = text.data() + text.size();
+    const auto [stop, error] = std::from_chars(text.data(), end, number);
+    const std::string range = std::to_string(least) + " to " + std::to_string(most);
+    if (!kyvhosting::IsWholeNumber(text)) {
+        throw CUsageError(std::string(what) + ": " + kyvhosting::Quoted(text) +
+                          " is not a whole number, " + range);
+    }
+    if (error != std::errc() || stop != end || number < least || number > most) {
+        throw CUsageError(std::string(what) + ": " + std::string(text) +
+                          " is out of range: " + range);
+    }
+    return number;
+}
 
 } // namespace kyvhost

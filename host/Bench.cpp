@@ -66,7 +66,7 @@ double MsOf(const std::function<void()>& work) {
 } // namespace
 
 void Bench(const ModuleDescriptor& module, const BenchOptions& options) {
-    const EffectDescriptor& effect = FindEffect(module, options.effect, kAllEffects);
+    const EffectDescriptor& effect = FindEffect(module, options.stage.effect, kAllEffects);
     const FrameShape shape = {options.size.width, options.size.height, false};
     std::vector<Contestant> contestants;
     for (const int32_t level : options.levels) {
@@ -75,6 +75,7 @@ void Bench(const ModuleDescriptor& module, const BenchOptions& options) {
         settings.level = level;
         CClipInstance& instance = *contestants.back().instance;
         settings.Apply(instance);
+        options.stage.Apply(instance);
         instance.Context().duration = PositionOfFrame(3600 * kRate.num, kRate);
         instance.Begin(shape);
     }

@@ -8,7 +8,7 @@
 namespace kyvhost {
 
 struct BenchOptions {
-    std::string effect;
+    StageOptions stage;
     EffectSettings settings; // its level does not count
     std::vector<int32_t> levels = {CpuLevel_Scalar, CpuLevel_Sse2, CpuLevel_Avx2};
     Size size = {1920, 1080};

@@ -1,27 +1,20 @@
 // The calling order of an effect instance.
 #include "host/ClipInstance.h"
 
+#include <algorithm>
 #include <cstring>
+#include <iterator>
 #include <string>
 
 #include "hosting/Error.h"
 #include "hosting/Names.h"
-#include "hosting/Text.h"
 #include "hosting/Values.h"
 
 namespace kyvhost {
 namespace {
 
-// Splits "name=value" and finds the parameter.
-uint32_t SplitAssignment(const EffectDescriptor& effect, std::string_view assignment,
-                         std::string_view example, std::string_view& value) {
-    const size_t equals = assignment.find('=');
-    if (equals == std::string_view::npos || equals == 0) {
-        throw CUsageError(Quoted(assignment) + " is not of the form " + std::string(example));
-    }
-    value = assignment.substr(equals + 1);
-    return FindParam(effect, assignment.substr(0, equals),
-                     "kyvhost info " + ShortName(effect) + " shows all");
+uint32_t ParamOf(const EffectDescriptor& effect, std::string_view name) {
+    return FindParam(effect, name, "kyvhost info " + ShortName(effect) + " shows all");
 }
 
 } // namespace
@@ -31,41 +24,58 @@ CClipInstance::CClipInstance(const EffectDescriptor& effect)
     Require(m_instance.Init(), effect, "InitInstance");
 }
 
-void CClipInstance::Set(std::string_view assignment) {
-    std::string_view text;
-    const uint32_t index = SplitAssignment(Effect(), assignment, "NAME=VALUE", text);
-    const ParamDescriptor& param = Effect().params[index];
-    ParseValue(param, assignment.substr(0, assignment.find('=')), text, Value(index));
+void CClipInstance::Set(std::string_view param, std::string_view value) {
+    const uint32_t index = ParamOf(Effect(), param);
+    ParseValue(Effect().params[index], param, value, Value(index));
     m_given[index] = true;
 }
 
-void CClipInstance::Animate(std::string_view assignment, Easing easing) {
-    std::string_view text;
-    const uint32_t index = SplitAssignment(Effect(), assignment, "NAME=FROM:TO", text);
-    const ParamDescriptor& param = Effect().params[index];
-    const std::string_view name = assignment.substr(0, assignment.find('='));
-    if (!CanAnimate(param)) {
-        throw CUsageError(std::string(name) + " is a " + TypeName(param) +
-                          " and has no values in between; use --set");
+void CClipInstance::AddKeyframe(std::string_view param, const Keyframe& keyframe) {
+    const uint32_t index = ParamOf(Effect(), param);
+    Key key = {keyframe.time, 0, keyframe.easing,
+               std::vector<uint8_t>(Effect().params[index].valueSize)};
+    ParseValue(Effect().params[index], param, keyframe.value, key.value.data());
+    auto track = std::find_if(m_tracks.begin(), m_tracks.end(),
+                              [index](const Track& one) { return one.index == index; });
+    if (track == m_tracks.end()) {
+        track = m_tracks.insert(track, {index, {}});
     }
-    const std::vector<std::string> parts = Split(text, ':');
-    if (parts.size() != 2 && parts.size() != 3) {
-        throw CUsageError(Quoted(assignment) +
-                          " is not of the form NAME=FROM:TO or NAME=FROM:TO:EASING");
-    }
-    Animation animation = {index, std::vector<uint8_t>(param.valueSize),
-                           std::vector<uint8_t>(param.valueSize),
-                           parts.size() == 3 ? ParseEasing(parts[2]) : easing};
-    ParseValue(param, name, parts[0], animation.from.data());
-    ParseValue(param, name, parts[1], animation.to.data());
-    m_animations.push_back(std::move(animation));
+    track->keys.push_back(std::move(key));
     m_given[index] = true;
 }
 
-void CClipInstance::ApplyAnimations(double fraction) {
-    for (const Animation& animation : m_animations) {
-        Interpolate(Effect().params[animation.index], animation.from.data(), animation.to.data(),
-                    Eased(animation.easing, fraction), Value(animation.index));
+bool CClipInstance::NeedsLength() const {
+    return std::any_of(m_tracks.begin(), m_tracks.end(), [](const Track& track) {
+        return std::any_of(track.keys.begin(), track.keys.end(),
+                           [](const Key& key) { return key.time.isShare; });
+    });
+}
+
+void CClipInstance::PlaceKeyframes(const FrameScale& scale) {
+    for (Track& track : m_tracks) {
+        for (Key& key : track.keys) {
+            key.frame = scale.At(key.time);
+        }
+        // Of two at one moment the later one given counts from there on: a jump.
+        std::stable_sort(track.keys.begin(), track.keys.end(),
+                         [](const Key& a, const Key& b) { return a.frame < b.frame; });
+    }
+}
+
+void CClipInstance::ApplyKeyframes(double frame) {
+    for (const Track& track : m_tracks) {
+        const ParamDescriptor& param = Effect().params[track.index];
+        const auto next = std::find_if(track.keys.begin(), track.keys.end(),
+                                       [frame](const Key& key) { return key.frame > frame; });
+        const Key& to = next == track.keys.end() ? track.keys.back() : *next;
+        const Key& from = next == track.keys.begin() ? track.keys.front() : *std::prev(next);
+        if (&from == &to || !CanAnimate(param)) {
+            std::memcpy(Value(track.index), from.value.data(), from.value.size());
+            continue;
+        }
+        Interpolate(param, from.value.data(), to.value.data(),
+                    Eased(from.easing, (frame - from.frame) / (to.frame - from.frame)),
+                    Value(track.index));
     }
 }
 

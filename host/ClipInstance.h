@@ -1,13 +1,13 @@
-// An instance as the command line describes it: values as text, values that move over the clip,
-// stereo views and fields.
+// An instance as the user describes it: values as text, values that change over the clip, stereo
+// views and fields.
 #pragma once
 
 #include <cstdint>
 #include <string_view>
 #include <vector>
 
-#include "host/Easing.h"
 #include "host/Hosting.h"
+#include "host/Keyframes.h"
 #include "hosting/Instance.h"
 
 namespace kyvhost {
@@ -20,13 +20,6 @@ struct FrameShape {
 
     size_t Pixels() const { return size_t{frameWidth} * height; }
     size_t Bytes() const { return Pixels() * 4; }
-};
-
-// A parameter that changes over the clip.
-struct Animation {
-    uint32_t index;
-    std::vector<uint8_t> from, to;
-    Easing easing;
 };
 
 class CClipInstance {
@@ -44,19 +37,24 @@ public:
     const uint8_t* Value(uint32_t index) const { return m_instance.Value(index); }
     uint8_t* Value(uint32_t index) { return m_instance.Value(index); }
 
-    // "P3=0.8" or "Degree=0.8". Throws CUsageError.
-    void Set(std::string_view assignment);
+    // By key, name or a part of a name. Throws CUsageError.
+    void Set(std::string_view param, std::string_view value);
 
-    // "P1=0:1", or "P1=0:1:in-out" with an easing of its own. Throws CUsageError.
-    void Animate(std::string_view assignment, Easing easing);
+    // A value for a moment. Between two of them the first one's easing leads from value to value;
+    // what has nothing in between, such as a choice, jumps. Throws CUsageError.
+    void AddKeyframe(std::string_view param, const Keyframe& keyframe);
 
-    // Whether a value of the parameter has been given by Set or Animate.
+    // Whether a value of the parameter has been given by Set or AddKeyframe.
     bool IsGiven(uint32_t index) const { return m_given[index]; }
 
-    bool IsAnimated() const { return !m_animations.empty(); }
+    // Whether keyframes are there whose time depends on the length of the clip.
+    bool NeedsLength() const;
 
-    // Gives every animated parameter its value for a fraction 0..1 of the clip.
-    void ApplyAnimations(double fraction);
+    // Brings the keyframes into the order of the clip. Before ApplyKeyframes.
+    void PlaceKeyframes(const FrameScale& scale);
+
+    // Gives every parameter with keyframes its value for a frame.
+    void ApplyKeyframes(double frame);
 
     // Sets size and layout and calls BeginProcessing.
     void Begin(const FrameShape& shape);
@@ -73,11 +71,22 @@ public:
     }
 
 private:
+    struct Key {
+        KeyTime time;
+        double frame; // once placed
+        Easing easing;
+        std::vector<uint8_t> value;
+    };
+    struct Track {
+        uint32_t index;
+        std::vector<Key> keys;
+    };
+
     void RenderRows(const uint8_t* const inputs[2], uint8_t* output, int64_t frameNumber);
 
     CInstance m_instance;
     std::vector<bool> m_given;
-    std::vector<Animation> m_animations;
+    std::vector<Track> m_tracks;
     FrameShape m_shape;
     bool m_bFirstField = false;
     bool m_bSecondField = false;

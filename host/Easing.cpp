@@ -9,14 +9,29 @@
 #include "hosting/Text.h"
 
 namespace kyvhost {
+namespace {
+
+constexpr std::array<const char*, 5> kNames = {"linear", "in", "out", "in-out", "hold"};
+
+} // namespace
+
+std::optional<Easing> FindEasing(std::string_view text) {
+    const auto name = std::find(kNames.begin(), kNames.end(), text);
+    return name == kNames.end() ? std::nullopt
+                                : std::optional(static_cast<Easing>(name - kNames.begin()));
+}
 
 Easing ParseEasing(std::string_view text) {
-    constexpr std::array<std::string_view, 4> kNames = {"linear", "in", "out", "in-out"};
-    const auto name = std::find(kNames.begin(), kNames.end(), text);
-    if (name == kNames.end()) {
-        throw CUsageError("no easing " + Quoted(text) + "; there are linear, in, out and in-out");
+    const std::optional<Easing> easing = FindEasing(text);
+    if (!easing) {
+        throw CUsageError("no easing " + Quoted(text) +
+                          "; there are linear, in, out, in-out and hold");
     }
-    return static_cast<Easing>(name - kNames.begin());
+    return *easing;
+}
+
+const char* EasingName(Easing easing) {
+    return kNames[static_cast<size_t>(easing)];
 }
 
 double Eased(Easing easing, double fraction) {
@@ -29,6 +44,8 @@ double Eased(Easing easing, double fraction) {
         return 1 - rest * rest * rest;
     case Easing::InOut:
         return t < 0.5 ? 4 * t * t * t : 1 - 4 * rest * rest * rest;
+    case Easing::Hold:
+        return 0;
     default:
         return t;
     }

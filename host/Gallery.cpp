@@ -85,10 +85,13 @@ struct Tile {
 Tile RenderTile(const EffectDescriptor& effect, const EffectSettings& settings,
                 const Picture& first, const Picture& second) {
     const Scene scene = SceneOf(effect);
-    EffectSettings own = settings;
-    own.sets = scene.sets;
+    StageOptions stage;
+    for (const std::string& set : scene.sets) {
+        AddValue(stage, set);
+    }
     CClipInstance instance(effect);
-    own.Apply(instance);
+    settings.Apply(instance);
+    stage.Apply(instance);
     instance.Context().position = std::llround(scene.seconds * 1e7);
     instance.Context().duration = std::llround(kClipSeconds * 1e7);
 

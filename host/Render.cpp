@@ -1,6 +1,9 @@
 // From files through effects to a file.
 #include "host/Render.h"
 
+#include <fstream>
+
+#include "host/EffectFile.h"
 #include "host/ExitStatus.h"
 #include "host/FileNames.h"
 #include "host/OutputFile.h"
@@ -54,6 +57,14 @@ void CheckClip(const RenderOptions& options) {
     }
 }
 
+void WriteText(const fs::path& file, const std::string& text) {
+    std::ofstream stream(file, std::ios::binary);
+    stream << text;
+    if (!stream.flush()) {
+        throw CHostError(ExitStatus::RenderingFailed, TextOf(file) + " cannot be written");
+    }
+}
+
 } // namespace
 
 const Container* OutputContainer(const RenderOptions& options) {
@@ -80,13 +91,9 @@ const Container* OutputContainer(const RenderOptions& options) {
 
 void EffectSettings::Apply(CClipInstance& instance) const {
     EffectContext& context = instance.Context();
-    for (const std::string& assignment : sets) {
-        instance.Set(assignment);
-    }
     context.pixelFormat = ayuv ? PixelFormat_Ayuv : PixelFormat_Argb;
-    context.cpuLevel = level;
+    context.cpuLevel = level | (wideMap ? int32_t{CpuLevelOption_WideMap} : 0);
     context.threadCount = threads;
-    context.randomSeed = seed;
     if (aspect) {
         context.displayAspectX = aspect->width;
         context.displayAspectY = aspect->height;
@@ -115,12 +122,20 @@ void Render(const ModuleDescriptor& module, const RenderOptions& options) {
         inputs.push_back(source.file);
     }
     COutput output(options.output, options.overwrite, inputs);
+    std::unique_ptr<COutputFile> saved;
+    if (!options.save.empty()) {
+        saved = std::make_unique<COutputFile>(options.save, options.overwrite, inputs);
+        WriteText(saved->Temporary(), EffectFileText(module, job.Stages(), options.save));
+    }
     if (IsStill(job)) {
         RenderStill(job, output.Temporary());
     } else {
         RenderClip(job, output.Temporary());
     }
     output.Commit();
+    if (saved) {
+        saved->Commit();
+    }
 }
 
 } // namespace kyvhost

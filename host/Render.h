@@ -8,8 +8,7 @@
 #include <vector>
 
 #include "host/Arguments.h"
-#include "host/ClipInstance.h"
-#include "host/Easing.h"
+#include "host/Stage.h"
 #include "host/VideoProbe.h"
 
 namespace kyvhost {
@@ -20,28 +19,17 @@ enum class Stereo {
     Split,      // the input holds two views already
 };
 
-// What an instance is told besides its frames.
+// What every instance of a rendering is told besides its frames.
 struct EffectSettings {
-    std::vector<std::string> sets; // "P3=0.8"
     bool ayuv = false;
     int32_t level = CpuLevel_Avx2;
+    bool wideMap = true; // the inner picture may have more than 1024 columns or rows
     uint32_t threads = 1;
-    uint32_t seed = 0;
     std::optional<Size> aspect; // of the display; the frame's own otherwise
     std::optional<float> preview;
     bool firstField = false, secondField = false;
 
-    // Throws CUsageError.
     void Apply(CClipInstance& instance) const;
-};
-
-// An effect, its values, and what it takes beside the picture that comes from before it.
-struct StageOptions {
-    std::string effect;
-    EffectSettings settings;
-    std::vector<std::string> animations;
-    Easing easing = Easing::Linear;
-    std::optional<std::filesystem::path> input2;
 };
 
 enum class FieldUse {
@@ -56,13 +44,13 @@ struct Pick {
 
 struct RenderOptions {
     std::vector<StageOptions> stages; // one at least
+    EffectSettings settings;
     Stereo stereo = Stereo::Mono;
     FieldUse fields = FieldUse::AsVideo;
     std::filesystem::path input, output;
     std::optional<double> time;     // seconds: of a still output
     std::optional<double> start;    // seconds left out of videos
     std::optional<double> duration; // seconds of the clip
-    double offset = 0;              // seconds of the animations that are left out
     std::optional<double> overlap;  // seconds in which two whole clips meet; they play side by
                                     // side from start to end otherwise
     std::optional<Rational> rate;
@@ -73,6 +61,7 @@ struct RenderOptions {
     std::vector<std::string> encoderOptions; // for ffmpeg, the last before the output
     uint32_t jobs = 0;                       // frames at a time; 0: the processor's cores
     VideoTools tools;
+    std::filesystem::path save;              // where the effects go, as a file; empty: nowhere
     bool overwrite = false;
     bool strict = false;
     bool quiet = false;

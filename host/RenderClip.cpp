@@ -239,12 +239,13 @@ std::unique_ptr<CRenderPool> CClip::Pool() {
     const uint32_t jobs = m_options.jobs > 0 ? m_options.jobs : cores;
     const FieldOrder fields =
         m_options.fields == FieldUse::AsVideo ? Fields() : FieldOrder::Progressive;
+    const FrameScale scale = {static_cast<double>(std::max<int64_t>(m_timeline.count - 1, 0)),
+                              m_rate.Value()};
     std::vector<std::unique_ptr<CStack>> stacks;
     for (uint32_t i = 0; i < jobs; ++i) {
         stacks.push_back(m_job.NewStack());
         stacks.back()->RunTransitions();
-        stacks.back()->SetDuration(PositionOfFrame(m_timeline.count, m_rate) +
-                                   UnitsOf(m_options.offset));
+        stacks.back()->SetClip(PositionOfFrame(m_timeline.count, m_rate), scale);
         stacks.back()->Begin(m_job.shape, fields);
     }
     return std::make_unique<CRenderPool>(std::move(stacks), m_job.shape.Bytes());
@@ -257,7 +258,7 @@ void CClip::Render(const fs::path& file) {
     } else {
         m_timeline.total = m_timeline.count = Frames();
     }
-    if (m_timeline.count == 0 && m_job.stack.IsAnimated()) {
+    if (m_timeline.count == 0 && m_job.stack.NeedsLength()) {
         throw CUsageError(TextOf(m_job.sources.front().file) +
                           " does not tell its length; animations need --duration");
     }
@@ -282,9 +283,9 @@ void CClip::Render(const fs::path& file) {
 void CClip::Add(CRenderPool& pool, std::vector<FramePtr> inputs, const FrameTime& time,
                 int64_t number) {
     Moment moment;
-    moment.position = time.position + UnitsOf(m_options.offset);
+    moment.position = time.position;
     moment.laterField = PositionOfFrame(1, {m_rate.num * 2, m_rate.den});
-    moment.fraction = m_timeline.count > 1 ? time.slot / double(m_timeline.count - 1) : 1;
+    moment.frame = time.slot;
     moment.frameNumber = number;
     pool.Add(std::move(inputs), moment);
 }

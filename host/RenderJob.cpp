@@ -77,6 +77,7 @@ RenderJob::RenderJob(const ModuleDescriptor& descriptor, const RenderOptions& wa
     OpenSources();
     SetShape();
     SetAspect(stack);
+    SayWhatIsCut();
     if (options.pick) {
         const ParamDescriptor& param = ColorParam(stack.First());
         const Source& source = sources.front();
@@ -84,9 +85,9 @@ RenderJob::RenderJob(const ModuleDescriptor& descriptor, const RenderOptions& wa
             throw CUsageError("--pick needs an input that can be read twice, not a pipe");
         }
         const double start = options.time.value_or(options.start.value_or(0));
-        picked = std::string(param.key) + "=" + MeanColor(PictureAt(source, start), *options.pick);
-        stack.SetFirst(picked);
-        notes.Tell("picked " + picked.substr(picked.find('=') + 1));
+        picked = {param.key, MeanColor(PictureAt(source, start), *options.pick)};
+        stack.SetFirst(*picked);
+        notes.Tell("picked " + picked->value);
     }
 }
 
@@ -101,7 +102,7 @@ const Source* RenderJob::FirstVideo() const {
 }
 
 FrameForm RenderJob::Form() const {
-    return {options.stages.front().settings.ayuv, options.stereo == Stereo::SideBySide};
+    return {options.settings.ayuv, options.stereo == Stereo::SideBySide};
 }
 
 Source RenderJob::Open(const fs::path& file) const {
@@ -164,6 +165,17 @@ void RenderJob::SetShape() {
     }
 }
 
+// The inner picture has the size of the frame, and without the wide map not all of it is reached.
+void RenderJob::SayWhatIsCut() {
+    constexpr uint32_t kReached = 1024;
+    const uint32_t view = shape.sideBySide ? shape.frameWidth / 2 : shape.frameWidth;
+    if (!options.settings.wideMap && stack.HasInnerPicture() &&
+        (view > kReached || shape.height > kReached)) {
+        notes.Say("of the inner picture only the first " + std::to_string(kReached) +
+                  " columns and rows are reached; without --narrow-map all are");
+    }
+}
+
 // Pixels that are not square make the display's shape another one than the frame's.
 void RenderJob::SetAspect(CStack& to) const {
     const Source& first = sources.front();
@@ -178,10 +190,18 @@ void RenderJob::SetAspect(CStack& to) const {
 std::unique_ptr<CStack> RenderJob::NewStack() const {
     auto made = std::make_unique<CStack>(module, options);
     SetAspect(*made);
-    if (!picked.empty()) {
-        made->SetFirst(picked);
+    if (picked) {
+        made->SetFirst(*picked);
     }
     return made;
+}
+
+std::vector<StageOptions> RenderJob::Stages() const {
+    std::vector<StageOptions> stages = options.stages;
+    if (picked) {
+        stages.front().values.push_back(*picked);
+    }
+    return stages;
 }
 
 Picture RenderJob::PictureAt(const Source& source, double seconds) const {

@@ -1,7 +1,6 @@
 // A rendering with its inputs opened: what stills and clips have in common.
 #pragma once
 
-#include <cmath>
 #include <filesystem>
 #include <vector>
 
@@ -36,6 +35,9 @@ struct RenderJob {
 
     FrameForm Form() const;
 
+    // As given, and with what has been picked.
+    std::vector<StageOptions> Stages() const;
+
     // A further stack like the first, for frames beside it.
     std::unique_ptr<CStack> NewStack() const;
 
@@ -45,12 +47,13 @@ struct RenderJob {
     CStack stack;
     std::vector<Source> sources; // one for each of the stack's inputs
     FrameShape shape;
-    std::string picked; // "P1=#C0B8A0", from a spot of the input
+    std::optional<Assignment> picked; // a colour, from a spot of the input
 
 private:
     Source Open(const std::filesystem::path& file) const;
     void OpenSources();
     void SetShape();
+    void SayWhatIsCut();
     void SetAspect(CStack& to) const;
 };
 
@@ -64,9 +67,5 @@ void RenderClip(RenderJob& job, const std::filesystem::path& file);
 
 // Seconds with what a person would write.
 std::string SecondsText(double seconds);
-
-inline int64_t UnitsOf(double seconds) {
-    return std::llround(seconds * 1e7);
-}
 
 } // namespace kyvhost

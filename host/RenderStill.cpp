@@ -67,9 +67,9 @@ void RenderStill(RenderJob& job, const std::filesystem::path& file) {
         inputs.push_back(frame.data());
     }
     Moment moment;
-    moment.position = UnitsOf(time + options.offset);
-    moment.fraction = duration > 0 ? time / duration : 0;
-    job.stack.SetDuration(UnitsOf(duration + options.offset));
+    moment.position = UnitsOf(time);
+    moment.frame = time;
+    job.stack.SetClip(UnitsOf(duration), {duration, 1});
     job.stack.Begin(job.shape, FieldOrder::Progressive);
     const FrameShape& shape = job.shape;
     Picture result = {shape.frameWidth, shape.height, std::vector<uint8_t>(shape.Bytes())};

@@ -44,10 +44,8 @@ CStack::CStack(const ModuleDescriptor& module, const RenderOptions& options) : m
         const EffectDescriptor& effect = FindEffect(module, stage.effect, kAllEffects);
         m_instances.push_back(std::make_unique<CClipInstance>(effect));
         CClipInstance& instance = *m_instances.back();
-        stage.settings.Apply(instance);
-        for (const std::string& animation : stage.animations) {
-            instance.Animate(animation, stage.easing);
-        }
+        options.settings.Apply(instance);
+        stage.Apply(instance);
         const bool takesTwo = effect.properties.inputCount == 2;
         if (takesTwo && !stage.input2) {
             throw CUsageError(ShortName(effect) +
@@ -60,9 +58,16 @@ CStack::CStack(const ModuleDescriptor& module, const RenderOptions& options) : m
     }
 }
 
-bool CStack::IsAnimated() const {
+bool CStack::HasInnerPicture() const {
+    return std::any_of(m_instances.begin(), m_instances.end(), [](const auto& instance) {
+        const EffectProperties& properties = instance->Effect().properties;
+        return properties.inputCount == 2 && !properties.isTransition;
+    });
+}
+
+bool CStack::NeedsLength() const {
     return std::any_of(m_instances.begin(), m_instances.end(),
-                       [](const auto& instance) { return instance->IsAnimated(); });
+                       [](const auto& instance) { return instance->NeedsLength(); });
 }
 
 void CStack::RunTransitions() {
@@ -71,24 +76,26 @@ void CStack::RunTransitions() {
         for (uint32_t k = 0; k < effect.paramCount && effect.properties.isTransition; ++k) {
             const ParamDescriptor& param = effect.params[k];
             if (WordsOfKey(param.nameKey) == "Percentage" && !m_instances[i]->IsGiven(k)) {
-                m_instances[i]->Animate(std::string(param.key) + "=0:1",
-                                        m_options.stages[i].easing);
+                const Easing easing = m_options.stages[i].easing;
+                m_instances[i]->AddKeyframe(param.key, {{0, true}, "0", easing});
+                m_instances[i]->AddKeyframe(param.key, {{100, true}, "1", easing});
             }
         }
     }
 }
 
-void CStack::SetDuration(int64_t duration) {
-    for (const auto& instance : m_instances) {
-        instance->Context().duration = duration;
+void CStack::SetClip(int64_t duration, const FrameScale& scale) {
+    for (size_t i = 0; i < m_instances.size(); ++i) {
+        m_instances[i]->Context().duration = duration + UnitsOf(m_options.stages[i].offset);
+        m_instances[i]->PlaceKeyframes(scale);
     }
 }
 
 void CStack::SetDefaultAspect(uint32_t width, uint32_t height) {
-    for (size_t i = 0; i < m_instances.size(); ++i) {
-        if (!m_options.stages[i].settings.aspect) {
-            m_instances[i]->Context().displayAspectX = width;
-            m_instances[i]->Context().displayAspectY = height;
+    for (const auto& instance : m_instances) {
+        if (!m_options.settings.aspect) {
+            instance->Context().displayAspectX = width;
+            instance->Context().displayAspectY = height;
         }
     }
 }
@@ -103,7 +110,7 @@ void CStack::Begin(const FrameShape& shape, FieldOrder fields) {
 
 void CStack::Render(std::span<const uint8_t* const> inputs, const Moment& moment, uint8_t* output) {
     for (const auto& instance : m_instances) {
-        instance->ApplyAnimations(moment.fraction);
+        instance->ApplyKeyframes(moment.frame);
     }
     if (m_fields == FieldOrder::Progressive) {
         RenderFrame(inputs, moment.position, moment, FieldSelector_Frame, output);
@@ -126,7 +133,7 @@ void CStack::RenderFrame(std::span<const uint8_t* const> inputs, int64_t positio
         }
         const bool takesTwo = instance.Effect().properties.inputCount == 2;
         const uint8_t* const both[2] = {first, takesTwo ? inputs[nextInput++] : first};
-        instance.Context().position = position;
+        instance.Context().position = position + UnitsOf(m_options.stages[i].offset);
         // The effects before it make whole pictures, which a later one may look at all over.
         if (field != FieldSelector_Frame) {
             const bool alone = isLast && !LeavesFieldsAlone(instance.Effect());

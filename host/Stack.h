@@ -1,6 +1,7 @@
 // The effects that a frame goes through, one after the other.
 #pragma once
 
+#include <cmath>
 #include <cstdint>
 #include <memory>
 #include <span>
@@ -13,11 +14,16 @@
 
 namespace kyvhost {
 
+// 100 ns
+inline int64_t UnitsOf(double seconds) {
+    return std::llround(seconds * 1e7);
+}
+
 // The moment of a clip that a frame shows.
 struct Moment {
     int64_t position = 0;    // 100 ns
     int64_t laterField = 0;  // 100 ns that the second field comes later
-    double fraction = 0;     // 0..1 of the clip
+    double frame = 0;        // on the clip's scale
     int64_t frameNumber = 0; // from 0, for messages
 };
 
@@ -31,17 +37,22 @@ public:
 
     const EffectDescriptor& First() const { return m_instances.front()->Effect(); }
 
-    // Whether a parameter of any effect changes over the clip.
-    bool IsAnimated() const;
+    // Whether one of the effects shows its second input inside the first.
+    bool HasInnerPicture() const;
+
+    // Whether a parameter of any effect changes with the length of the clip.
+    bool NeedsLength() const;
 
     // Lets transitions run from one input to the other unless the user has said otherwise.
     void RunTransitions();
 
-    // A value of the first effect, "P1=0.5".
-    void SetFirst(const std::string& assignment) { m_instances.front()->Set(assignment); }
+    // A value of the first effect.
+    void SetFirst(const Assignment& assignment) {
+        m_instances.front()->Set(assignment.param, assignment.value);
+    }
 
-    // For each context, before Begin.
-    void SetDuration(int64_t duration);
+    // The clip's length in 100 ns, and its frames. Before Begin.
+    void SetClip(int64_t duration, const FrameScale& scale);
     void SetDefaultAspect(uint32_t width, uint32_t height);
 
     // Frames of two fields are rendered field by field, each as a picture of its own time.

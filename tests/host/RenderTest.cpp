@@ -111,7 +111,7 @@ TEST_F(RenderTest, TheContextHoldsWhatTheOptionsSay) {
     EXPECT_EQ(Wide(plain, Word_Duration), 100'000'000);
     EXPECT_EQ(plain[Word_Preview], 0U);
     EXPECT_EQ(plain[Word_Threads], 1U);
-    EXPECT_EQ(plain[Word_Level], 5U);
+    EXPECT_EQ(plain[Word_Level], 5U + CpuLevelOption_WideMap);
     EXPECT_EQ(plain[Word_Byte], 13U);
     EXPECT_EQ(plain[Word_Color], 0x563412U);
 
@@ -127,7 +127,8 @@ TEST_F(RenderTest, TheContextHoldsWhatTheOptionsSay) {
     EXPECT_EQ(set[Word_AspectX], 16U);
     EXPECT_EQ(set[Word_AspectY], 9U);
     EXPECT_EQ(set[Word_Threads], 7U);
-    EXPECT_EQ(set[Word_Level], 3U);
+    EXPECT_EQ(set[Word_Level], 3U + CpuLevelOption_WideMap);
+    EXPECT_EQ(Probe({"--narrow-map", "--level", "4"})[Word_Level], 4U);
     EXPECT_EQ(set[Word_Seed], 4'000'000'000U);
     EXPECT_EQ(set[Word_Byte], 20U);
     EXPECT_EQ(set[Word_Color], 0x030201U);
@@ -146,6 +147,51 @@ TEST_F(RenderTest, AnimationsGoAlongTheirCurve) {
     EXPECT_EQ(amount("P2=1:0", "in"), 0.984375F);
     EXPECT_EQ(amount("P2=0:1:in-out", "in"), 0.0625F);
     EXPECT_EQ(amount("P2=0:1:out", "in"), 1 - 0.421875F);
+}
+
+TEST_F(RenderTest, KeyframesOfEveryKindOfValue) {
+    const auto words = [this](const std::string& time) {
+        return Probe({"--time",      time,          "--duration", "8s",
+                      "--key",       "P2@4s=1:hold", "--key",     "P2@25%=0.5:in",
+                      "--key",       "P2@6s=0.25",  "--key",      "P3@0s=10",
+                      "--key",       "P3@8=20",     "--key",      "P4@0s=#000000",
+                      "--key",       "P4@100%=#FF8000"});
+    };
+    const auto amount = [&](const std::string& time) {
+        return std::bit_cast<float>(words(time)[Word_Amount]);
+    };
+    EXPECT_EQ(amount("1s"), 0.5F);    // before the first, which is at 2 s
+    EXPECT_EQ(amount("3s"), 0.5625F); // half the way to 1 by an eighth
+    EXPECT_EQ(amount("5.9s"), 1);
+    EXPECT_EQ(amount("6s"), 0.25F);
+    EXPECT_EQ(amount("8s"), 0.25F); // behind the last
+    EXPECT_EQ(words("4s")[Word_Byte], 15U);
+    EXPECT_EQ(words("4s")[Word_Color], 0x004080U); // 255 / 2 and 128 / 2, red in the lowest byte
+    // A choice has nothing in between. Mode 1 of the probe fails to begin, 2 to process.
+    const auto mode = [this](const std::string& time) {
+        return RunHostWith(ProbeModule(),
+                           {"render", "probe", "-y", Path("in.png"), Path("out.png"), "--time", time,
+                            "--key", "P1@0s=fine", "--key", "P1@6s=no_process"})
+            .status;
+    };
+    EXPECT_EQ(mode("5.9s"), 0);
+    EXPECT_EQ(mode("6s"), 1);
+}
+
+TEST_F(RenderTest, WithoutTheWideMapItIsSaidWhatIsCut) {
+    for (const uint32_t columns : {1024U, 1030U}) {
+        const std::string in = Write("in.png", columns, std::vector<uint32_t>(columns, 0xFF808080));
+        const std::vector<std::string> pip = {"render", "4", in, Path("out.png"), "-y",
+                                              "--input2", in};
+        const auto run = [&](std::vector<std::string> more) {
+            more.insert(more.begin(), pip.begin(), pip.end());
+            return RunHost(more);
+        };
+        EXPECT_EQ(run({"--strict"}).error, "");
+        const bool cut = columns > 1024;
+        EXPECT_THAT(run({"--narrow-map"}).error, HasSubstr(cut ? "only the first 1024" : ""));
+        EXPECT_EQ(run({"--narrow-map", "--strict"}).status, cut ? 1 : 0);
+    }
 }
 
 TEST_F(RenderTest, StereoIsTwoCallsIntoOneFrame) {
@@ -313,7 +359,14 @@ TEST_F(RenderTest, ErrorsAreOneLineWithAStatus) {
         {{"render", "4", in, out, "--set", "alpha=3"}, 2, {"P11, P13, P19, P28"}},
         {{"render", "2", in, out, "--animate", "P1=0:2"}, 2, {"P1", "0 to 1"}},
         {{"render", "2", in, out, "--animate", "P1=0:1:fast"}, 2, {"\"fast\"", "in-out"}},
-        {{"render", "9", in, out, "--animate", "P5=0:1"}, 2, {"choice", "--set"}},
+        {{"render", "9", in, out, "--animate", "P5=0:ring"}, 2, {"\"ring\"", "box, circle"}},
+        {{"render", "2", in, out, "--key", "P1=1"}, 2, {"NAME@TIME=VALUE"}},
+        {{"render", "2", in, out, "--key", "P1@1x=1"}, 2, {"\"1x\" is not a time"}},
+        {{"render", "2", in, out, "--key", "P1@101%=1"}, 2, {"101%", "0% to 100%"}},
+        {{"render", "2", in, out, "--key", "P1@1s=1:fast"}, 2, {"\"fast\"", "hold"}},
+        {{"render", "2", in, out, "--then", "bubbel"}, 2, {"bubbel", "bubble"}},
+        {{"render", "2", in, out, "--save", "look.txt"}, 2, {"look.txt", ".json"}},
+        {{"render", "none.json", in, out}, 3, {"none.json cannot be read"}},
         {{"render", "6", in, out}, 2, {"two inputs", "--input2"}},
         {{"render", "11", in, out, "--input2", in}, 2, {"one input"}},
         {{"render", "11", in, Path("out.xyz")}, 2, {"out.xyz", ".png", ".mp4"}},
