@@ -8,6 +8,7 @@
 #include <functional>
 #include <memory>
 #include <random>
+#include <utility>
 
 #include <nlohmann/json.hpp>
 
@@ -46,16 +47,10 @@ Picture Pattern(const Size& size, uint32_t seed) {
     return picture;
 }
 
-struct Contestant {
-    int32_t level;
-    std::unique_ptr<CClipInstance> instance;
-    std::vector<double> ms;
-
-    double Median() {
-        std::nth_element(ms.begin(), ms.begin() + ms.size() / 2, ms.end());
-        return ms[ms.size() / 2];
-    }
-};
+double Median(std::vector<double> times) {
+    std::nth_element(times.begin(), times.begin() + times.size() / 2, times.end());
+    return times[times.size() / 2];
+}
 
 double MsOf(const std::function<void()>& work) {
     const Clock::time_point start = Clock::now();
@@ -63,80 +58,114 @@ double MsOf(const std::function<void()>& work) {
     return std::chrono::duration<double, std::milli>(Clock::now() - start).count();
 }
 
+// Milliseconds of every round.
+struct FrameTimes {
+    struct Level {
+        int32_t level;
+        std::vector<double> ms;
+    };
+    std::vector<Level> levels;
+    std::vector<double> copies;
+};
+
+// The levels take turns, so that a busy or throttled machine slows them alike.
+class CRace {
+public:
+    CRace(const EffectDescriptor& effect, const BenchOptions& options)
+        : m_shape{options.size.width, options.size.height, false}, m_output(m_shape.Bytes()) {
+        for (const int32_t level : options.levels) {
+            m_times.levels.push_back({level, {}});
+            CClipInstance& instance =
+                *m_instances.emplace_back(std::make_unique<CClipInstance>(effect));
+            EffectSettings settings = options.settings;
+            settings.level = level;
+            settings.Apply(instance);
+            options.stage.Apply(instance);
+            instance.Context().duration = PositionOfFrame(3600 * kRate.num, kRate);
+            instance.Begin(m_shape);
+        }
+        const FrameForm form = {options.settings.ayuv, false};
+        for (int i = 0; i < 2; ++i) {
+            Picture pattern = Pattern(options.size, i + 1);
+            m_inputs[i] = std::move(pattern.pixels);
+            form.Apply(m_inputs[i], pattern.width);
+        }
+    }
+
+    // rounds 0: about two seconds for each level.
+    FrameTimes Run(int rounds) {
+        double slowest = 0; // a first frame each, which also builds what is built once
+        for (const auto& instance : m_instances) {
+            RenderFrame(*instance, kFirstFrame);
+            slowest = std::max(slowest, MsOf([&] { RenderFrame(*instance, kFirstFrame + 1); }));
+        }
+        if (rounds == 0) {
+            rounds = std::clamp(static_cast<int>(kSecondsPerLevel * 1000 / slowest), kLeastRounds,
+                                kMostRounds);
+        }
+        for (int round = 0; round < rounds; ++round) {
+            for (size_t i = 0; i < m_instances.size(); ++i) {
+                m_times.copies.push_back(MsOf(
+                    [&] { std::memcpy(m_output.data(), m_inputs[0].data(), m_shape.Bytes()); }));
+                m_times.levels[i].ms.push_back(
+                    MsOf([&] { RenderFrame(*m_instances[i], kFirstFrame + 2 + round); }));
+            }
+        }
+        return std::move(m_times);
+    }
+
+private:
+    void RenderFrame(CClipInstance& instance, int64_t frame) {
+        const uint8_t* const inputs[2] = {m_inputs[0].data(), m_inputs[1].data()};
+        instance.Context().position = PositionOfFrame(frame, kRate);
+        instance.Render(inputs, m_output.data(), frame);
+    }
+
+    FrameShape m_shape;
+    std::vector<std::unique_ptr<CClipInstance>> m_instances;
+    Frame m_inputs[2], m_output;
+    FrameTimes m_times;
+};
+
+void PrintJson(const EffectDescriptor& effect, const BenchOptions& options,
+               const FrameTimes& times) {
+    const double copyMs = Median(times.copies);
+    json result = {{"effect", effect.identifier},
+                   {"width", options.size.width},
+                   {"height", options.size.height},
+                   {"format", options.settings.ayuv ? "ayuv" : "argb"},
+                   {"threads", options.settings.threads},
+                   {"rounds", times.levels.front().ms.size()},
+                   {"memcpyMs", copyMs},
+                   {"levels", json::array()}};
+    for (const FrameTimes::Level& level : times.levels) {
+        const double ms = Median(level.ms);
+        result["levels"].push_back({{"level", level.level}, {"ms", ms}, {"memcpys", ms / copyMs}});
+    }
+    std::printf("%s\n", result.dump(2).c_str());
+}
+
+void PrintTable(const EffectDescriptor& effect, const BenchOptions& options,
+                const FrameTimes& times) {
+    const double copyMs = Median(times.copies);
+    std::printf("%s, %ux%u %s, %u thread%s, median of %zu\n", ShortName(effect).c_str(),
+                options.size.width, options.size.height, options.settings.ayuv ? "AYUV" : "ARGB",
+                options.settings.threads, options.settings.threads == 1 ? "" : "s",
+                times.levels.front().ms.size());
+    std::printf("level   ms/frame   x memcpy   frames/s\n");
+    std::printf("memcpy %9.3f %10.2f %10.0f\n", copyMs, 1.0, 1000 / copyMs);
+    for (const FrameTimes::Level& level : times.levels) {
+        const double ms = Median(level.ms);
+        std::printf("%-6d %9.3f %10.2f %10.0f\n", level.level, ms, ms / copyMs, 1000 / ms);
+    }
+}
+
 } // namespace
 
 void Bench(const ModuleDescriptor& module, const BenchOptions& options) {
     const EffectDescriptor& effect = FindEffect(module, options.stage.effect, kAllEffects);
-    const FrameShape shape = {options.size.width, options.size.height, false};
-    std::vector<Contestant> contestants;
-    for (const int32_t level : options.levels) {
-        contestants.push_back({level, std::make_unique<CClipInstance>(effect), {}});
-        EffectSettings settings = options.settings;
-        settings.level = level;
-        CClipInstance& instance = *contestants.back().instance;
-        settings.Apply(instance);
-        options.stage.Apply(instance);
-        instance.Context().duration = PositionOfFrame(3600 * kRate.num, kRate);
-        instance.Begin(shape);
-    }
-    const FrameForm form = {options.settings.ayuv, false};
-    const auto first = StillSource(Pattern(options.size, 1), form);
-    const auto second = StillSource(Pattern(options.size, 2), form);
-    const std::optional<TimedFrame> firstFrame = first->Next(), secondFrame = second->Next();
-    const uint8_t* const inputs[2] = {firstFrame->pixels->data(), secondFrame->pixels->data()};
-    std::vector<uint8_t> output(shape.Bytes());
-    std::vector<double> copies;
-
-    const auto renderFrame = [&](CClipInstance& instance, int64_t frame) {
-        instance.Context().position = PositionOfFrame(frame, kRate);
-        instance.Render(inputs, output.data(), frame);
-    };
-    double slowest = 0; // a first frame each, which also builds what is built once
-    for (const Contestant& contestant : contestants) {
-        renderFrame(*contestant.instance, kFirstFrame);
-        slowest =
-            std::max(slowest, MsOf([&] { renderFrame(*contestant.instance, kFirstFrame + 1); }));
-    }
-    const int rounds = options.rounds > 0
-                           ? options.rounds
-                           : std::clamp(static_cast<int>(kSecondsPerLevel * 1000 / slowest),
-                                        kLeastRounds, kMostRounds);
-    for (int round = 0; round < rounds; ++round) {
-        for (Contestant& contestant : contestants) {
-            copies.push_back(MsOf([&] { std::memcpy(output.data(), inputs[0], shape.Bytes()); }));
-            contestant.ms.push_back(
-                MsOf([&] { renderFrame(*contestant.instance, kFirstFrame + 2 + round); }));
-        }
-    }
-    std::nth_element(copies.begin(), copies.begin() + copies.size() / 2, copies.end());
-    const double copyMs = copies[copies.size() / 2];
-
-    if (options.json) {
-        json result = {{"effect", effect.identifier},
-                       {"width", options.size.width},
-                       {"height", options.size.height},
-                       {"format", options.settings.ayuv ? "ayuv" : "argb"},
-                       {"threads", options.settings.threads},
-                       {"rounds", rounds},
-                       {"memcpyMs", copyMs},
-                       {"levels", json::array()}};
-        for (Contestant& contestant : contestants) {
-            const double ms = contestant.Median();
-            result["levels"].push_back(
-                {{"level", contestant.level}, {"ms", ms}, {"memcpys", ms / copyMs}});
-        }
-        std::printf("%s\n", result.dump(2).c_str());
-        return;
-    }
-    std::printf("%s, %ux%u %s, %u thread%s, median of %d\n", ShortName(effect).c_str(),
-                options.size.width, options.size.height, options.settings.ayuv ? "AYUV" : "ARGB",
-                options.settings.threads, options.settings.threads == 1 ? "" : "s", rounds);
-    std::printf("level   ms/frame   x memcpy   frames/s\n");
-    std::printf("memcpy %9.3f %10.2f %10.0f\n", copyMs, 1.0, 1000 / copyMs);
-    for (Contestant& contestant : contestants) {
-        const double ms = contestant.Median();
-        std::printf("%-6d %9.3f %10.2f %10.0f\n", contestant.level, ms, ms / copyMs, 1000 / ms);
-    }
+    const FrameTimes times = CRace(effect, options).Run(options.rounds);
+    (options.json ? PrintJson : PrintTable)(effect, options, times);
 }
 
 } // namespace kyvhost

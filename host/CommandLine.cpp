@@ -75,6 +75,7 @@ public:
         AddList();
         AddInfo();
         AddRender();
+        AddPlay();
         AddBench();
         AddGallery();
     }
@@ -90,8 +91,9 @@ public:
             if (!m_app.remaining(true).empty()) {
                 RefuseExtra();
             }
-            throw CUsageError(WithHint(
-                Verb() ? error.what() : "a verb is missing: list, info, render, bench or gallery"));
+            throw CUsageError(
+                WithHint(Verb() ? error.what()
+                                : "a verb is missing: list, info, render, play, bench or gallery"));
         }
         m_action();
         FlushOutput();
@@ -130,6 +132,11 @@ private:
     void AddRender() {
         m_render.AddRender(AddVerb("render", "Renders a picture or a video through effects.",
                                    &CCommandLine::RenderFile));
+    }
+
+    void AddPlay() {
+        m_play.AddPlay(AddVerb("play", "Shows a clip through effects in a window, with sound.",
+                               &CCommandLine::PlayFile));
     }
 
     void AddBench() {
@@ -202,6 +209,11 @@ private:
         Render(module.Descriptor(), m_render.Options(module.Descriptor()));
     }
 
+    void PlayFile() {
+        const CModule module = Load();
+        Play(module.Descriptor(), m_play.Options(module.Descriptor()));
+    }
+
     void BenchEffect() {
         m_bench.stage.effect = m_effect;
         for (const std::string& set : m_sets) {
@@ -267,7 +279,7 @@ private:
     std::vector<std::string> m_sets;
     bool m_bJson = false;
     bool m_bOverwrite = false;
-    CRenderArguments m_render;
+    CRenderArguments m_render, m_play;
     BenchOptions m_bench;
     GalleryOptions m_gallery;
 };

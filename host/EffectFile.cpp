@@ -77,8 +77,8 @@ private:
     }
 
     void Check(const JsonNode& node, std::string_view key, Kind kind) {
-        constexpr std::array kNames = {"null", "true or false", "a number",
-                                       "a text", "a list", "an object"};
+        constexpr std::array kNames = {"null",   "true or false", "a number",
+                                       "a text", "a list",        "an object"};
         if (node.kind != kind) {
             Refuse(node, key,
                    std::string("is ") + kNames[static_cast<size_t>(node.kind)] + ", not " +
@@ -274,8 +274,8 @@ json StageJson(const ModuleDescriptor& module, const StageOptions& stage, const 
     }
     if (stage.input2) {
         const bool isDash = *stage.input2 == "-";
-        const fs::path name = isDash ? *stage.input2
-                                     : fs::absolute(*stage.input2).lexically_proximate(folder);
+        const fs::path name =
+            isDash ? *stage.input2 : fs::absolute(*stage.input2).lexically_proximate(folder);
         object["input2"] = TextOf(name.generic_u8string());
     }
     return object;

@@ -21,10 +21,11 @@ auto Started(const std::string& program, const std::string& option, ExitStatus s
         return start();
     } catch (const std::system_error& error) {
         if (!option.empty()) {
-            throw CUsageError(
-                "--ffmpeg: " + Quoted(option) +
-                (program == option ? " cannot be started (" : " has no ffprobe beside it (") +
-                error.code().message() + ")");
+            throw CUsageError("--ffmpeg: " + Quoted(option) +
+                              (program == option ? " cannot be started ("
+                                                 : " has no " + TextOf(PathOf(program).filename()) +
+                                                       " beside it (") +
+                              error.code().message() + ")");
         }
         throw CHostError(status, "videos need " + program + ", which cannot be started (" +
                                      error.code().message() +

@@ -1,6 +1,9 @@
 // From files through effects to a file.
 #include "host/Render.h"
 
+#include <algorithm>
+#include <array>
+#include <cmath>
 #include <fstream>
 
 #include "host/EffectFile.h"
@@ -57,6 +60,25 @@ void CheckClip(const RenderOptions& options) {
     }
 }
 
+// The part of its size at which the clip keeps pace here.
+double PlayableScale(RenderJob& job) {
+    constexpr double kSpare = 0.75; // the rest is for showing the frames
+    constexpr std::array kScales = {1.0, 0.75, 0.5, 0.375, 0.25, 0.1875};
+    const Source* const video = job.FirstVideo();
+    const Rational wanted = job.options.rate.value_or(video ? video->video.rate : kStillClipRate);
+    // Frames of a quarter of the pixels take a quarter of the time.
+    const double side = std::sqrt(RenderingRate(job) * kSpare / wanted.Value());
+    const auto fits = std::find_if(kScales.begin(), kScales.end(),
+                                   [side](double scale) { return scale <= side; });
+    return fits == kScales.end() ? kScales.back() : *fits;
+}
+
+void CheckRawSize(const RenderOptions& options) {
+    if (options.size && !IsPipe(options.input)) {
+        throw CUsageError("--size is for raw frames that come over a pipe");
+    }
+}
+
 void WriteText(const fs::path& file, const std::string& text) {
     std::ofstream stream(file, std::ios::binary);
     stream << text;
@@ -105,6 +127,28 @@ void EffectSettings::Apply(CClipInstance& instance) const {
     instance.SetFields(firstField, secondField);
 }
 
+void Play(const ModuleDescriptor& module, const RenderOptions& options) {
+    CheckRawSize(options);
+    RenderJob job(module, options);
+    const bool pipe = std::any_of(job.sources.begin(), job.sources.end(),
+                                  [](const Source& source) { return source.media.pipe; });
+    // A pipe is read but once.
+    const double scale = pipe || options.scale ? 1 : PlayableScale(job);
+    if (scale == 1) {
+        PlayClip(job);
+        return;
+    }
+    RenderOptions reduced = options;
+    reduced.scale = scale;
+    RenderJob small(module, reduced);
+    const auto text = [](const Size& size) {
+        return std::to_string(size.width) + " x " + std::to_string(size.height);
+    };
+    small.notes.Tell("shown at " + text(small.inputSize) + ": the machine is too slow for " +
+                     text(job.inputSize));
+    PlayClip(small);
+}
+
 void Render(const ModuleDescriptor& module, const RenderOptions& options) {
     // What the names and options alone tell comes before anything is opened.
     const Container* const container = OutputContainer(options);
@@ -113,9 +157,7 @@ void Render(const ModuleDescriptor& module, const RenderOptions& options) {
     } else {
         CheckStill(options);
     }
-    if (options.size && !IsPipe(options.input)) {
-        throw CUsageError("--size is for raw frames that come over a pipe");
-    }
+    CheckRawSize(options);
     RenderJob job(module, options);
     std::vector<fs::path> inputs;
     for (const Source& source : job.sources) {

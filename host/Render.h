@@ -51,6 +51,10 @@ struct RenderOptions {
     std::optional<double> time;     // seconds: of a still output
     std::optional<double> start;    // seconds left out of videos
     std::optional<double> duration; // seconds of the clip
+    double from = 0;                // seconds of the clip that are passed over: it goes on then
+                                    // as if they had been rendered
+    std::optional<double> scale;    // of the inputs' width and height, at most 1; for playing
+                                    // what keeps pace, else 1
     std::optional<double> overlap;  // seconds in which two whole clips meet; they play side by
                                     // side from start to end otherwise
     std::optional<Rational> rate;
@@ -61,12 +65,17 @@ struct RenderOptions {
     std::vector<std::string> encoderOptions; // for ffmpeg, the last before the output
     uint32_t jobs = 0;                       // frames at a time; 0: the processor's cores
     VideoTools tools;
-    std::filesystem::path save;              // where the effects go, as a file; empty: nowhere
+    std::filesystem::path save; // where the effects go, as a file; empty: nowhere
+    bool proxy = false;         // small and quick
     bool overwrite = false;
     bool strict = false;
     bool quiet = false;
 };
 
 void Render(const ModuleDescriptor& module, const RenderOptions& options);
+
+// Shows the clip in a window, with sound, as fast as it is meant to go: at a reduced size when the
+// machine cannot keep pace with the whole one.
+void Play(const ModuleDescriptor& module, const RenderOptions& options);
 
 } // namespace kyvhost

@@ -2,6 +2,8 @@
 #include "host/RenderArguments.h"
 
 #include <cmath>
+#include <cstdio>
+#include <iterator>
 #include <utility>
 
 #include "host/Arguments.h"
@@ -40,17 +42,20 @@ Pick ParsePick(std::string_view what, const std::string& text) {
     return pick;
 }
 
-float ParsePreview(std::string_view text) {
-    double fraction = -1;
+double ParseNumber(std::string_view what, std::string_view text, double least, double most) {
+    double number = 0;
     const char* const end = text.data() + text.size();
-    const auto [stop, error] = std::from_chars(text.data(), end, fraction);
-    if (error != std::errc() || stop != end || std::isnan(fraction)) {
-        throw CUsageError("--preview: " + Quoted(text) + " is not a number, 0 to 1");
+    const auto [stop, error] = std::from_chars(text.data(), end, number);
+    char range[64];
+    std::snprintf(range, sizeof range, "%g to %g", least, most);
+    if (error != std::errc() || stop != end || std::isnan(number)) {
+        throw CUsageError(std::string(what) + ": " + Quoted(text) + " is not a number, " + range);
     }
-    if (fraction < 0 || fraction > 1) {
-        throw CUsageError("--preview: " + std::string(text) + " is out of range: 0 to 1");
+    if (number < least || number > most) {
+        throw CUsageError(std::string(what) + ": " + std::string(text) +
+                          " is out of range: " + range);
     }
-    return static_cast<float>(fraction);
+    return number;
 }
 
 } // namespace
@@ -71,12 +76,13 @@ void AddSettings(CLI::App* verb, EffectSettings& settings) {
 }
 
 void AddDisplay(CLI::App* verb, EffectSettings& settings) {
-    AddText(verb, "--aspect", "W:H", "shape of the display; default: the frame's own",
+    AddText(
+        verb, "--aspect", "W:H", "shape of the display; default: the frame's own",
+        [&settings](const std::string& text) { settings.aspect = ParseAspect("--aspect", text); });
+    AddText(verb, "--effect-preview", "0..1", "show the moment that effects have for previews",
             [&settings](const std::string& text) {
-                settings.aspect = ParseAspect("--aspect", text);
+                settings.preview = static_cast<float>(ParseNumber("--effect-preview", text, 0, 1));
             });
-    AddText(verb, "--preview", "0..1", "show the moment that effects have for previews",
-            [&settings](const std::string& text) { settings.preview = ParsePreview(text); });
 }
 
 void AddLevel(CLI::App* verb, EffectSettings& settings) {
@@ -115,15 +121,17 @@ RenderOptions CRenderArguments::Options(const ModuleDescriptor& module) const {
     RenderOptions options = m_options;
     options.input = ParsePath("INPUT", m_input);
     options.output = ParsePath("OUTPUT", m_output);
-    for (const StageText& text : m_stages) {
+    for (size_t i = 0; i < m_stages.size(); ++i) {
+        const StageText& text = m_stages[i];
+        const std::string& name = i == 0 ? m_effect : text.effect;
         std::vector<StageOptions> stages(1);
-        if (IsEffectFileName(text.effect)) {
-            stages = ReadEffectFile(module, PathOf(text.effect));
+        if (IsEffectFileName(name)) {
+            stages = ReadEffectFile(module, PathOf(name));
         } else {
-            stages.front().effect = text.effect;
+            stages.front().effect = name;
         }
         if (stages.size() > 1 && !text.IsPlain()) {
-            throw CUsageError(text.effect + " holds " + std::to_string(stages.size()) +
+            throw CUsageError(name + " holds " + std::to_string(stages.size()) +
                               " effects; --set and the like are for one: write them into the file");
         }
         text.Apply(stages.front());
@@ -161,8 +169,23 @@ void CRenderArguments::AddRender(CLI::App* verb) {
     AddRunning(verb);
 }
 
+void CRenderArguments::AddPlay(CLI::App* verb) {
+    AddStages(verb);
+    AddText(verb, "--at", "TIME", "where in the clip to begin to look; default: its start",
+            [this](const std::string& text) { m_options.from = ParseTime("--at", text); });
+    AddText(verb, "--scale", "0.05..1",
+            "of the picture's sides; default: 1, or less where the machine does not keep pace",
+            [this](const std::string& text) {
+                m_options.scale = ParseNumber("--scale", text, 0.05, 1);
+            });
+    AddTimes(verb);
+    AddFrames(verb);
+    AddRunning(verb);
+    m_output = "-";
+}
+
 void CRenderArguments::AddStages(CLI::App* verb) {
-    verb->add_option("EFFECT", m_stages.front().effect,
+    verb->add_option("EFFECT", m_effect,
                      "the effect; \"kyvhost list\" shows all; or a file of effects (.json)")
         ->required()
         ->type_name("");
@@ -273,6 +296,8 @@ void CRenderArguments::AddOutput(CLI::App* verb) {
         ->take_all()
         ->trigger_on_parse()
         ->allow_extra_args(false);
+    verb->add_flag("--preview", m_options.proxy,
+                   "a quick small clip to look at: at most 360 rows, coded in haste");
     AddText(verb, "--save", "FILE",
             "write the effects with their values and keyframes into a file as well (.json)",
             [this](const std::string& text) {

@@ -32,6 +32,7 @@ int32_t ParseLevel(std::string_view text);
 class CRenderArguments {
 public:
     void AddRender(CLI::App* verb);
+    void AddPlay(CLI::App* verb);
 
     // What has been parsed, with files of effects read. Throws CUsageError and CHostError.
     RenderOptions Options(const ModuleDescriptor& module) const;
@@ -62,8 +63,8 @@ private:
                       Read&& read);
 
     RenderOptions m_options;
-    std::vector<StageText> m_stages{1};
-    std::string m_input, m_output;
+    std::vector<StageText> m_stages{1}; // the first one's name is the argument
+    std::string m_effect, m_input, m_output;
 };
 
 } // namespace kyvhost

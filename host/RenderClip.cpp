@@ -1,12 +1,16 @@
 // Many moments as a video.
 #include <algorithm>
+#include <array>
+#include <chrono>
 #include <cmath>
+#include <functional>
 #include <limits>
 #include <numeric>
 #include <thread>
 
 #include "host/ExitStatus.h"
 #include "host/FileNames.h"
+#include "host/Player.h"
 #include "host/Progress.h"
 #include "host/RenderJob.h"
 #include "host/RenderPool.h"
@@ -17,8 +21,6 @@ namespace kyvhost {
 namespace {
 
 namespace fs = std::filesystem;
-
-constexpr Rational kStillClipRate = {30, 1};
 
 // Which frames of the result the effects make; total 0: to the end, wherever that is.
 struct Timeline {
@@ -71,8 +73,16 @@ public:
         : m_job(job), m_options(job.options), m_pMaster(job.FirstVideo()), m_rate(Rate()) {}
 
     void Render(const fs::path& file);
+    void Play();
+    double MeasuredRate();
 
 private:
+    // Takes a finished frame; false when no more are wanted.
+    using Take = std::function<bool(FramePtr, int64_t nanoseconds)>;
+
+    class CInputs;
+
+    void SetTimeline();
     Rational Rate() const;
     int64_t Frames();
     Timeline Joined() const;
@@ -80,19 +90,25 @@ private:
     VideoFormat Format() const;
     FieldOrder Fields() const;
     std::unique_ptr<CFrameSource> Open(const Source& source, bool onGrid) const;
-    std::unique_ptr<CRenderPool> Pool();
+    std::unique_ptr<CRenderPool> Pool() const;
+    double Seconds(int64_t slot) const { return static_cast<double>(slot) / m_rate.Value(); }
+    double SkippedSeconds() const;
 
-    int64_t RenderJoined(CRenderPool& pool, CFrameSink& sink, CProgress& progress);
-    int64_t RenderTogether(CRenderPool& pool, CFrameSink& sink, CProgress& progress);
+    // All frames go to take, in order. How many.
+    int64_t RenderAll(const Take& take);
+    int64_t RenderJoined(CRenderPool& pool, const Take& take);
+    int64_t RenderTogether(CRenderPool& pool, const Take& take);
+    void Write(const VideoFormat& format, const fs::path& file);
     void Add(CRenderPool& pool, std::vector<FramePtr> inputs, const FrameTime& time,
              int64_t number);
-    void Drain(CRenderPool& pool, CFrameSink& sink, bool all);
+    bool Drain(CRenderPool& pool, const Take& take, bool all);
 
     RenderJob& m_job;
     const RenderOptions& m_options;
     const Source* m_pMaster; // whose times the result has; null when all are pictures
     Rational m_rate;
     Timeline m_timeline;
+    int64_t m_nFrom = 0;         // slots that are passed over
     std::deque<int64_t> m_times; // nanoseconds of the frames that are on their way
 };
 
@@ -192,12 +208,16 @@ VideoFormat CClip::Format() const {
         }
     }
     format.codec = &FindCodec(codec);
+    if (m_options.proxy && (codec == "h264" || codec == "h265")) {
+        constexpr std::array kHaste = {"-preset", "ultrafast", "-crf", "28"};
+        format.options.insert(format.options.begin(), kHaste.begin(), kHaste.end());
+    }
     format.tick = TickFor(m_rate, m_pMaster && !m_options.rate ? &m_pMaster->video : nullptr);
     if (!m_pMaster) {
         return format;
     }
     const VideoInfo& video = m_pMaster->video;
-    const double skipped = m_options.start.value_or(0);
+    const double skipped = m_options.start.value_or(0) + Seconds(m_nFrom);
     format.sampleAspect = video.sampleAspect;
     format.isBt709 = video.isBt709;
     format.labels = video.labels;
@@ -213,18 +233,18 @@ VideoFormat CClip::Format() const {
         format.startSeconds = video.startSeconds;
     }
     if (skipped > 0 || m_options.duration || m_job.sources.size() > 1) {
-        carried.seconds = static_cast<double>(m_timeline.total) / m_rate.Value();
+        carried.seconds = Seconds(m_timeline.total - m_nFrom);
     }
     format.carried = std::move(carried);
     return format;
 }
 
 std::unique_ptr<CFrameSource> CClip::Open(const Source& source, bool onGrid) const {
-    const uint32_t width = m_job.sources.front().Width(), height = m_job.shape.height;
+    const auto [width, height] = m_job.inputSize;
     if (source.isPicture) {
-        return StillSource(m_job.PictureAt(source, 0), m_job.Form());
+        return StillSource(m_job.PictureAt(source, 0, m_job.inputSize), m_job.Form());
     }
-    const double skipped = m_options.start.value_or(0);
+    const double skipped = SkippedSeconds();
     ReaderForm form = {width, height, skipped > 0 ? source.video.startSeconds + skipped : 0, {}};
     if (onGrid) {
         form.rate = m_rate;
@@ -234,7 +254,14 @@ std::unique_ptr<CFrameSource> CClip::Open(const Source& source, bool onGrid) con
         height, m_job.Form());
 }
 
-std::unique_ptr<CRenderPool> CClip::Pool() {
+// Of the videos, up to the first frame that is wanted. Stamps are rounded: half a frame less makes
+// sure of that frame.
+double CClip::SkippedSeconds() const {
+    const double passed = m_nFrom > 0 ? (static_cast<double>(m_nFrom) - 0.5) / m_rate.Value() : 0;
+    return m_options.start.value_or(0) + passed;
+}
+
+std::unique_ptr<CRenderPool> CClip::Pool() const {
     const uint32_t cores = std::max(1U, std::thread::hardware_concurrency());
     const uint32_t jobs = m_options.jobs > 0 ? m_options.jobs : cores;
     const FieldOrder fields =
@@ -251,7 +278,7 @@ std::unique_ptr<CRenderPool> CClip::Pool() {
     return std::make_unique<CRenderPool>(std::move(stacks), m_job.shape.Bytes());
 }
 
-void CClip::Render(const fs::path& file) {
+void CClip::SetTimeline() {
     m_job.stack.RunTransitions();
     if (m_options.overlap) {
         m_timeline = Joined();
@@ -262,22 +289,73 @@ void CClip::Render(const fs::path& file) {
         throw CUsageError(TextOf(m_job.sources.front().file) +
                           " does not tell its length; animations need --duration");
     }
-    const VideoFormat format = Format();
-    for (const std::string& loss : Losses(format)) {
-        m_job.notes.Say(loss);
+    m_nFrom = std::llround(m_options.from * m_rate.Value());
+    if (m_timeline.total > 0 && m_nFrom >= m_timeline.total) {
+        throw CUsageError("--at: " + SecondsText(m_options.from) +
+                          " is out of range: the clip lasts " +
+                          SecondsText(Seconds(m_timeline.total)));
     }
-    std::unique_ptr<CRenderPool> pool = Pool();
+}
+
+int64_t CClip::RenderAll(const Take& take) {
+    const std::unique_ptr<CRenderPool> pool = Pool();
+    return m_timeline.joined ? RenderJoined(*pool, take) : RenderTogether(*pool, take);
+}
+
+void CClip::Write(const VideoFormat& format, const fs::path& file) {
     CFrameSink sink(std::make_unique<CVideoWriter>(m_options.tools, file, format),
                     m_job.Form().ayuv);
-    CProgress progress(m_timeline.total, m_options.quiet);
-    const int64_t frames = m_timeline.joined ? RenderJoined(*pool, sink, progress)
-                                             : RenderTogether(*pool, sink, progress);
+    CProgress progress(m_timeline.total > 0 ? m_timeline.total - m_nFrom : 0, m_options.quiet);
+    int64_t written = 0;
+    const int64_t frames = RenderAll([&](FramePtr frame, int64_t nanoseconds) {
+        sink.Put(std::move(frame), nanoseconds);
+        progress.Update(++written);
+        return true;
+    });
     if (frames == 0) {
         throw CHostError(ExitStatus::InputUnreadable,
                          TextOf(m_job.sources.front().file) + " holds no frames");
     }
     sink.Finish();
     progress.Finish(frames);
+}
+
+void CClip::Render(const fs::path& file) {
+    SetTimeline();
+    const VideoFormat format = Format();
+    for (const std::string& loss : Losses(format)) {
+        m_job.notes.Say(loss);
+    }
+    Write(format, file);
+}
+
+void CClip::Play() {
+    SetTimeline();
+    VideoFormat format = Format();
+    format.playerTitle =
+        TextOf(m_job.sources.front().file.filename()) + ": " + EffectName(m_job.stack.First());
+    try {
+        Write(format, "-");
+    } catch (const CPlayerClosed&) { // by the user
+    }
+}
+
+double CClip::MeasuredRate() {
+    using Clock = std::chrono::steady_clock;
+    constexpr auto kLongest = std::chrono::milliseconds(1500);
+    constexpr int64_t kFrames = 24, kWarmUp = 3; // the first ones fill caches and pipes
+    SetTimeline();
+    const Clock::time_point start = Clock::now();
+    Clock::time_point warm = start, last = start;
+    int64_t taken = 0;
+    RenderAll([&](const FramePtr&, int64_t) {
+        last = Clock::now();
+        warm = ++taken <= kWarmUp ? last : warm;
+        return taken < kFrames && last - start < kLongest;
+    });
+    const double seconds = std::chrono::duration<double>(last - warm).count();
+    return taken > kWarmUp && seconds > 0 ? static_cast<double>(taken - kWarmUp) / seconds
+                                          : m_rate.Value();
 }
 
 void CClip::Add(CRenderPool& pool, std::vector<FramePtr> inputs, const FrameTime& time,
@@ -290,19 +368,22 @@ void CClip::Add(CRenderPool& pool, std::vector<FramePtr> inputs, const FrameTime
     pool.Add(std::move(inputs), moment);
 }
 
-// Hands finished frames on, so that few are on their way.
-void CClip::Drain(CRenderPool& pool, CFrameSink& sink, bool all) {
-    while (all ? !pool.IsEmpty() : pool.IsFull()) {
-        sink.Put(pool.Take(), m_times.front());
+// Hands finished frames on, so that few are on their way. False when no more are wanted.
+bool CClip::Drain(CRenderPool& pool, const Take& take, bool all) {
+    bool wanted = true;
+    while (wanted && (all ? !pool.IsEmpty() : pool.IsFull())) {
+        FramePtr frame = pool.Take();
+        wanted = take(std::move(frame), m_times.front());
         m_times.pop_front();
     }
+    return wanted;
 }
 
-int64_t CClip::RenderJoined(CRenderPool& pool, CFrameSink& sink, CProgress& progress) {
+int64_t CClip::RenderJoined(CRenderPool& pool, const Take& take) {
     const auto first = Open(m_job.sources[0], true), second = Open(m_job.sources[1], true);
     FramePtr inputs[2];
     int64_t frame = 0;
-    for (;; ++frame) {
+    for (bool wanted = true; wanted; ++frame) {
         const int64_t step = frame - m_timeline.from; // of the effect
         const bool before = step < 0, behind = step >= m_timeline.count;
         if (!behind) {
@@ -323,64 +404,89 @@ int64_t CClip::RenderJoined(CRenderPool& pool, CFrameSink& sink, CProgress& prog
         } else {
             Add(pool, {inputs[0], inputs[1]}, TimeOfSlot(step, m_rate), frame);
         }
-        Drain(pool, sink, false);
-        progress.Update(frame + 1);
+        wanted = Drain(pool, take, false);
     }
-    Drain(pool, sink, true);
+    Drain(pool, take, true);
     return frame;
 }
 
-int64_t CClip::RenderTogether(CRenderPool& pool, CFrameSink& sink, CProgress& progress) {
-    const bool onGrid = m_options.rate.has_value();
-    std::unique_ptr<CFrameSource> master;
-    std::vector<std::unique_ptr<CFollower>> followers;
-    for (const Source& source : m_job.sources) {
-        std::unique_ptr<CFrameSource> opened = Open(source, onGrid);
-        if (&source == m_pMaster) {
-            master = std::move(opened);
-            followers.push_back(nullptr);
-            continue;
+// The inputs of a clip that are shown together: the one whose times the result has, and those that
+// follow it.
+class CClip::CInputs {
+public:
+    explicit CInputs(const CClip& clip) : m_clip(clip) {
+        const bool onGrid = clip.m_options.rate.has_value();
+        const Source* const master = clip.m_pMaster;
+        for (const Source& source : clip.m_job.sources) {
+            std::unique_ptr<CFrameSource> opened = clip.Open(source, onGrid);
+            if (&source == master) {
+                m_pMaster = std::move(opened);
+                m_followers.push_back(nullptr);
+                continue;
+            }
+            const double frameSeconds = source.isPicture ? std::numeric_limits<double>::infinity()
+                                                         : 1 / source.video.rate.Value();
+            m_followers.push_back(
+                std::make_unique<CFollower>(std::move(opened), clip.m_rate, frameSeconds));
         }
-        const double frameSeconds = source.isPicture ? std::numeric_limits<double>::infinity()
-                                                     : 1 / source.video.rate.Value();
-        followers.push_back(std::make_unique<CFollower>(std::move(opened), m_rate, frameSeconds));
+        m_bSnaps = onGrid || !master || master->video.isRegular;
+        m_tick =
+            onGrid || !master ? Rational{clip.m_rate.den, clip.m_rate.num} : master->video.timeBase;
+        if (clip.m_nFrom > 0) { // stamps are counted from what has been skipped
+            m_start = clip.m_options.start.value_or(0) - clip.SkippedSeconds();
+        }
     }
+
+    // A frame of each input; none at the end. number counts them.
+    std::vector<FramePtr> Next(int64_t number, FrameTime& time) {
+        time = TimeOfSlot(m_clip.m_nFrom + number, m_clip.m_rate);
+        std::optional<TimedFrame> next;
+        if (m_pMaster) {
+            next = m_pMaster->Next();
+            if (!next) {
+                return {};
+            }
+            m_start = m_start.value_or(next->seconds);
+            time = TimeOf(next->seconds - *m_start, m_clip.m_rate, m_tick, m_bSnaps);
+        }
+        const double passed = time.slot - static_cast<double>(m_clip.m_nFrom);
+        std::vector<FramePtr> frames;
+        for (const auto& follower : m_followers) {
+            frames.push_back(follower ? follower->At(passed / m_clip.m_rate.Value())
+                                      : next->pixels);
+            if (!frames.back()) {
+                return {};
+            }
+        }
+        return frames;
+    }
+
+private:
+    const CClip& m_clip;
+    std::unique_ptr<CFrameSource> m_pMaster;
+    std::vector<std::unique_ptr<CFollower>> m_followers;
+    bool m_bSnaps;
+    Rational m_tick;
+    std::optional<double> m_start; // the stamp of the clip's start
+};
+
+int64_t CClip::RenderTogether(CRenderPool& pool, const Take& take) {
     // What a file says about its length may be wrong: only what the user has said is a limit.
     const bool limited = !m_pMaster || m_options.duration;
-    const bool snaps = onGrid || !m_pMaster || m_pMaster->video.isRegular;
-    const Rational tick =
-        onGrid || !m_pMaster ? Rational{m_rate.den, m_rate.num} : m_pMaster->video.timeBase;
-    std::optional<double> start;
+    CInputs inputs(*this);
+    const int64_t passed = TimeOfSlot(m_nFrom, m_rate).nanoseconds;
     int64_t frame = 0;
-    for (;; ++frame) {
-        std::optional<TimedFrame> next;
-        FrameTime time = TimeOfSlot(frame, m_rate);
-        double seconds = time.slot / m_rate.Value();
-        if (master) {
-            next = master->Next();
-            if (!next) {
-                break;
-            }
-            start = start.value_or(next->seconds);
-            seconds = next->seconds - *start;
-            time = TimeOf(seconds, m_rate, tick, snaps);
-        }
-        if (limited && std::llround(time.slot) >= m_timeline.total) {
+    for (bool wanted = true; wanted; ++frame) {
+        FrameTime time;
+        std::vector<FramePtr> frames = inputs.Next(frame, time);
+        if (frames.empty() || (limited && std::llround(time.slot) >= m_timeline.total)) {
             break;
         }
-        std::vector<FramePtr> inputs;
-        for (const auto& follower : followers) {
-            inputs.push_back(follower ? follower->At(time.slot / m_rate.Value()) : next->pixels);
-        }
-        if (std::find(inputs.begin(), inputs.end(), nullptr) != inputs.end()) {
-            break;
-        }
-        m_times.push_back(time.nanoseconds);
-        Add(pool, std::move(inputs), time, frame);
-        Drain(pool, sink, false);
-        progress.Update(frame + 1);
+        m_times.push_back(std::max<int64_t>(time.nanoseconds - passed, 0));
+        Add(pool, std::move(frames), time, frame);
+        wanted = Drain(pool, take, false);
     }
-    Drain(pool, sink, true);
+    Drain(pool, take, true);
     return frame;
 }
 
@@ -388,6 +494,14 @@ int64_t CClip::RenderTogether(CRenderPool& pool, CFrameSink& sink, CProgress& pr
 
 void RenderClip(RenderJob& job, const fs::path& file) {
     CClip(job).Render(file);
+}
+
+void PlayClip(RenderJob& job) {
+    CClip(job).Play();
+}
+
+double RenderingRate(RenderJob& job) {
+    return CClip(job).MeasuredRate();
 }
 
 } // namespace kyvhost

@@ -15,6 +15,8 @@ namespace {
 
 namespace fs = std::filesystem;
 
+constexpr uint32_t kProxyRows = 360;
+
 // The mean colour of a disc, as #RRGGBB.
 std::string MeanColor(const Picture& picture, const Pick& pick) {
     if (pick.x >= picture.width || pick.y >= picture.height) {
@@ -68,6 +70,11 @@ const ParamDescriptor& ColorParam(const EffectDescriptor& effect) {
     return *found;
 }
 
+// A reduced side: a multiple of four, so that two fields of half the rows have chroma of their own.
+uint32_t Scaled(uint32_t side, double scale) {
+    return scale < 1 ? std::max(1U, static_cast<uint32_t>(side * scale / 4)) * 4 : side;
+}
+
 } // namespace
 
 RenderJob::RenderJob(const ModuleDescriptor& descriptor, const RenderOptions& wanted)
@@ -85,7 +92,8 @@ RenderJob::RenderJob(const ModuleDescriptor& descriptor, const RenderOptions& wa
             throw CUsageError("--pick needs an input that can be read twice, not a pipe");
         }
         const double start = options.time.value_or(options.start.value_or(0));
-        picked = {param.key, MeanColor(PictureAt(source, start), *options.pick)};
+        const Size whole = {source.Width(), source.Height()};
+        picked = {param.key, MeanColor(PictureAt(source, start, whole), *options.pick)};
         stack.SetFirst(*picked);
         notes.Tell("picked " + picked->value);
     }
@@ -156,7 +164,12 @@ void RenderJob::OpenSources() {
 
 void RenderJob::SetShape() {
     const Source& first = sources.front();
-    shape = {first.Width(), first.Height(), options.stereo != Stereo::Mono};
+    double scale = options.scale.value_or(1);
+    if (options.proxy) {
+        scale = std::min(scale, double{kProxyRows} / first.Height());
+    }
+    inputSize = {Scaled(first.Width(), scale), Scaled(first.Height(), scale)};
+    shape = {inputSize.width, inputSize.height, options.stereo != Stereo::Mono};
     if (options.stereo == Stereo::SideBySide) {
         shape.frameWidth *= 2;
     } else if (options.stereo == Stereo::Split && shape.frameWidth % 2 != 0) {
@@ -204,8 +217,8 @@ std::vector<StageOptions> RenderJob::Stages() const {
     return stages;
 }
 
-Picture RenderJob::PictureAt(const Source& source, double seconds) const {
-    const uint32_t width = sources.front().Width(), height = shape.height;
+Picture RenderJob::PictureAt(const Source& source, double seconds, const Size& size) const {
+    const auto [width, height] = size;
     if (source.isPicture) {
         const Picture& picture = source.picture;
         return picture.width == width && picture.height == height ? picture

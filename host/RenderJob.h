@@ -27,8 +27,8 @@ struct Source {
 struct RenderJob {
     RenderJob(const ModuleDescriptor& descriptor, const RenderOptions& wanted);
 
-    // The file without the effects: the first input's size, at a time of its own.
-    Picture PictureAt(const Source& source, double seconds) const;
+    // The file without the effects, at a time of its own.
+    Picture PictureAt(const Source& source, double seconds, const Size& size) const;
 
     bool AllPictures() const;
     const Source* FirstVideo() const; // null when there is none
@@ -46,6 +46,7 @@ struct RenderJob {
     CNotes notes;
     CStack stack;
     std::vector<Source> sources; // one for each of the stack's inputs
+    Size inputSize = {};         // of all inputs' frames: the first one's, scaled
     FrameShape shape;
     std::optional<Assignment> picked; // a colour, from a spot of the input
 
@@ -57,13 +58,19 @@ private:
     void SetAspect(CStack& to) const;
 };
 
-constexpr double kStillClipSeconds = 10; // of a clip of pictures, when nothing says more
+// Of a clip of pictures, when nothing says more.
+constexpr double kStillClipSeconds = 10;
+constexpr Rational kStillClipRate = {30, 1};
 
 // The output's form: that of --output-format, or of the name's ending. Null for a still picture.
 const Container* OutputContainer(const RenderOptions& options);
 
 void RenderStill(RenderJob& job, const std::filesystem::path& file);
 void RenderClip(RenderJob& job, const std::filesystem::path& file);
+void PlayClip(RenderJob& job);
+
+// Frames a second that the clip is rendered with, as far as a moment of it tells.
+double RenderingRate(RenderJob& job);
 
 // Seconds with what a person would write.
 std::string SecondsText(double seconds);

@@ -59,7 +59,7 @@ void RenderStill(RenderJob& job, const std::filesystem::path& file) {
             job.notes.Say("effects work with 8 bits a component; the video has " +
                           std::to_string(source.video.bits));
         }
-        Picture picture = job.PictureAt(source, time);
+        Picture picture = job.PictureAt(source, time, job.inputSize);
         frames.push_back(std::move(picture.pixels));
         job.Form().Apply(frames.back(), picture.width);
     }

@@ -65,8 +65,7 @@ void AddKeyframe(StageOptions& stage, std::string_view text, Easing easing) {
         throw CUsageError(Quoted(text) + " is not of the form NAME@TIME=VALUE");
     }
     Keyframe keyframe;
-    keyframe.time =
-        ParseKeyTime("--key", std::string_view(assignment.param).substr(at + 1));
+    keyframe.time = ParseKeyTime("--key", std::string_view(assignment.param).substr(at + 1));
     keyframe.easing = TakeEasing(assignment.value, easing);
     keyframe.value = assignment.value;
     stage.keyframes.push_back({assignment.param.substr(0, at), keyframe});

@@ -8,6 +8,7 @@
 #include "host/Ffmpeg.h"
 #include "host/FileNames.h"
 #include "host/FrameStream.h"
+#include "host/Player.h"
 #include "hosting/Text.h"
 
 namespace kyvhost {
@@ -401,9 +402,16 @@ CVideoWriter::CVideoWriter(const VideoTools& tools, const fs::path& file, const 
         throw CHostError(ExitStatus::RenderingFailed,
                          "frames of videos have at most 67 megapixels");
     }
-    m_pFfmpeg = std::make_unique<CFfmpeg>(
-        tools.ffmpeg, tools.Option(), WriterArguments(file, format), ChildStream::Pipe,
-        IsDash(file) ? ChildStream::Own : ChildStream::Null, ExitStatus::RenderingFailed);
+    const bool plays = !format.playerTitle.empty();
+    m_pFfmpeg = std::make_unique<CFfmpeg>(tools.ffmpeg, tools.Option(),
+                                          WriterArguments(file, format), ChildStream::Pipe,
+                                          plays          ? ChildStream::Pipe
+                                          : IsDash(file) ? ChildStream::Own
+                                                         : ChildStream::Null,
+                                          ExitStatus::RenderingFailed);
+    if (plays) {
+        m_pPlayer = std::make_unique<CPlayer>(tools, format.playerTitle, m_pFfmpeg->Process());
+    }
     const std::vector<uint8_t> header = FrameStreamHeader(format.width, format.height, format.rate);
     if (!m_pFfmpeg->Process().WriteInput(header.data(), header.size())) {
         Fail();
@@ -426,6 +434,9 @@ void CVideoWriter::Finish() {
     if (m_pFfmpeg->Wait() != 0 || m_pFfmpeg->HasNamed(m_argument)) {
         Fail();
     }
+    if (m_pPlayer) {
+        m_pPlayer->Finish();
+    }
 }
 
 void CVideoWriter::Abort() {
@@ -433,6 +444,9 @@ void CVideoWriter::Abort() {
 }
 
 void CVideoWriter::Fail() {
+    if (m_pPlayer) {
+        m_pPlayer->ThrowIfEnded();
+    }
     const int status = m_pFfmpeg->Wait();
     const std::string line = m_pFfmpeg->LastLineAbout(m_argument);
     throw CHostError(ExitStatus::RenderingFailed,

@@ -15,6 +15,7 @@
 namespace kyvhost {
 
 class CFfmpeg; // a running ffmpeg
+class CPlayer;
 
 // The sound of two clips, the second fading in where the first fades out. An empty name is silence.
 struct SoundJoin {
@@ -47,6 +48,7 @@ struct VideoFormat {
     std::optional<CarriedSource> carried; // one or the other
     std::optional<SoundJoin> join;
     std::vector<std::string> options; // the user's, for the encoder; they come last
+    std::string playerTitle;          // not empty: the video goes into a window of this name
 };
 
 // What of all that is lost or changed on the way, a sentence each.
@@ -60,7 +62,7 @@ public:
     ~CVideoWriter();
 
     // Times never go back. Throws CHostError with RenderingFailed and ffmpeg's last line when
-    // ffmpeg has given up.
+    // ffmpeg has given up, and CPlayerClosed when the window has been closed.
     void Write(const uint8_t* frame, int64_t nanoseconds);
 
     // Waits until the file is complete. Throws likewise.
@@ -75,6 +77,7 @@ private:
     std::string m_argument;
     size_t m_frameBytes;
     std::unique_ptr<CFfmpeg> m_pFfmpeg;
+    std::unique_ptr<CPlayer> m_pPlayer; // reads from ffmpeg
 };
 
 } // namespace kyvhost

@@ -1,4 +1,5 @@
 // Stacks of effects and their files.
+#include <algorithm>
 #include <fstream>
 #include <iterator>
 
@@ -58,13 +59,18 @@ TEST_F(EffectFileTest, AStackIsOneEffectAfterTheOther) {
 
 TEST_F(EffectFileTest, WhatIsSavedRendersTheSame) {
     Write("b.png", 40, std::vector<uint32_t>(40 * 30, 0xFF2060A0));
-    const std::vector<std::string> options = {
-        "--animate", "density=0.2:1:in-out", "--offset", "3s", "--seed", "7",
-        "--then",    "light-ray",            "--set",    "P2=0.5,0.25",
-        "--then",    "white-balance",        "--key",    "P1@0s=#FFFFFF",
-        "--key",     "P1@50%=#80A0FF",       "--then",   "alpha-transition",
-        "--input2",  Path("b.png"),          "--set",    "P1=0.3",
-        "--set",     "P4=on"};
+    const std::vector<std::string> options = {"--animate", "density=0.2:1:in-out",
+                                              "--offset",  "3s",
+                                              "--seed",    "7",
+                                              "--then",    "light-ray",
+                                              "--set",     "P2=0.5,0.25",
+                                              "--then",    "white-balance",
+                                              "--key",     "P1@0s=#FFFFFF",
+                                              "--key",     "P1@50%=#80A0FF",
+                                              "--then",    "alpha-transition",
+                                              "--input2",  Path("b.png"),
+                                              "--set",     "P1=0.3",
+                                              "--set",     "P4=on"};
     std::vector<std::string> saving = options;
     saving.insert(saving.end(), {"--save", Path("look.json")});
     const std::vector<uint32_t> wanted = Render("bubble", saving);
@@ -132,8 +138,9 @@ TEST_F(EffectFileTest, WhatIsSavedRendersTheSame) {
     File("soft.json", R"({"kyv": 1, "name": "Soft", "effects": [
         {"effect": "dreamy", "values": {"P1": 5}}]})");
     EXPECT_EQ(Render(Path("soft.json"), {"--set", "P1=12"}), Render("dreamy", {"--set", "P1=12"}));
-    EXPECT_EQ(Render("color-temperature", {"--set", "P1=0.4", "--then", Path("soft.json")}),
-              Render("color-temperature", {"--set", "P1=0.4", "--then", "dreamy", "--set", "P1=5"}));
+    EXPECT_EQ(
+        Render("color-temperature", {"--set", "P1=0.4", "--then", Path("soft.json")}),
+        Render("color-temperature", {"--set", "P1=0.4", "--then", "dreamy", "--set", "P1=5"}));
 }
 
 TEST_F(EffectFileTest, ErrorsNameLineAndKey) {
@@ -150,8 +157,7 @@ TEST_F(EffectFileTest, ErrorsNameLineAndKey) {
          "line 2: \"efect\" is not known here; the nearest is effect"},
         {head + "{\n\"effect\": \"dreemy\"}]}", "line 3: "},
         {head + "{\"effect\": 7}]}", "line 2: \"effect\" is a number, not a text"},
-        {head + "{\"effect\": \"dreamy\", \"values\": {\n\n\"P1\": 5,\n\"P77\": 1}}]}",
-         "line 5: "},
+        {head + "{\"effect\": \"dreamy\", \"values\": {\n\n\"P1\": 5,\n\"P77\": 1}}]}", "line 5: "},
         {head + "{\"effect\": \"dreamy\", \"values\": {\n\"P1\": \"much\"}}]}",
          "line 3: P1: \"much\" is not"},
         {head + "{\"effect\": \"dreamy\", \"values\": {\n\"P1\": [\n{\"time\": 0, \"value\": 5},\n"
@@ -168,11 +174,11 @@ TEST_F(EffectFileTest, ErrorsNameLineAndKey) {
         const HostResult result =
             RunHost({"render", Path("bad.json"), Path("in.png"), Path("out.png")});
         EXPECT_EQ(result.status, 2) << text;
-        EXPECT_THAT(result.error,
-                    AllOf(StartsWith("kyvhost: "), HasSubstr("bad.json, " + error)));
+        EXPECT_THAT(result.error, AllOf(StartsWith("kyvhost: "), HasSubstr("bad.json, " + error)));
         EXPECT_EQ(std::count(result.error.begin(), result.error.end(), '\n'), 1) << result.error;
     }
-    const std::string two = File("two.json", head + R"({"effect": "dreamy"}, {"effect": "bubble"}]})");
+    const std::string two =
+        File("two.json", head + R"({"effect": "dreamy"}, {"effect": "bubble"}]})");
     EXPECT_THAT(RunHost({"render", two, Path("in.png"), Path("out.png"), "--set", "P1=5"}).error,
                 HasSubstr("holds 2 effects"));
     EXPECT_THAT(Files(), testing::Not(testing::Contains("out.png")));

@@ -275,6 +275,59 @@ TEST_F(FootageTest, SequencesAndFormatsOfPictures) {
     EXPECT_EQ(Read("webp.png").size(), 64U * 36);
 }
 
+TEST_F(FootageTest, PlayingGoesOnFromAnyMoment) {
+    Make("-f lavfi -i testsrc=s=64x36:r=25:d=2 -f lavfi -i sine=d=2 -c:v ffv1 -c:a pcm_s16le",
+         "in.mkv");
+    // A player that keeps what it is shown; one that a user closes at once; the real one.
+    for (const char* name : {"ffmpeg", "ffprobe", "ffplay"}) {
+        std::ofstream(Path(name)) << "#!/bin/sh\n"
+                                  << (std::string(name) == "ffplay"
+                                          ? "case $KYV_PLAYER in keep) exec cat >\"$0.nut\" ;; "
+                                            "close) exit 0 ;; fail) echo no window >&2; exit 1 "
+                                            ";; *) exec ffplay \"$@\" ;; esac\n"
+                                          : std::string("exec ") + name + " \"$@\"\n");
+        std::filesystem::permissions(Path(name), std::filesystem::perms::owner_all);
+    }
+    const auto play = [this](const std::string& player, const std::string& scale = "1") {
+        return RunProgram("env", {"SDL_VIDEODRIVER=dummy", "SDL_AUDIODRIVER=dummy",
+                                  "KYV_PLAYER=" + player, HostFile(), "play", "bubble",
+                                  Path("in.mkv"), "--at", "1.2s", "--animate", "P3=0.2:1",
+                                  "--offset", "3s", "--scale", scale, "--ffmpeg", Path("ffmpeg")});
+    };
+    const HostResult kept = play("keep");
+    EXPECT_EQ(kept.status, 0) << kept.error;
+    RunHost({"render", "bubble", Path("in.mkv"), Path("whole.mkv"), "--codec", "ffv1", "--animate",
+             "P3=0.2:1", "--offset", "3s"});
+    const std::string whole = Frames("whole.mkv"), shown = Frames("ffplay.nut");
+    ASSERT_EQ(whole.size(), size_t{64 * 36 * 4 * 50});
+    EXPECT_EQ(shown.size(), size_t{64 * 36 * 4 * 20}); // of 50 frames those from the 30th on
+    EXPECT_TRUE(whole.ends_with(shown));
+    EXPECT_THAT(Times("ffplay.nut"), testing::StartsWith("0.000000\n0.04"));
+    const json probe = Probe("ffplay.nut");
+    ASSERT_EQ(probe["streams"].size(), 2U);
+    const std::string sound =
+        RunProgram("ffmpeg", {"-v", "error", "-i", Path("ffplay.nut"), "-f", "s16le", "-"}).output;
+    EXPECT_NEAR(static_cast<double>(sound.size()) / 2 / 44100, 0.8, 0.05);
+
+    EXPECT_EQ(play("keep", "0.5").status, 0); // 32 x 16, multiples of four
+    EXPECT_EQ(Frames("ffplay.nut").size(), size_t{32 * 16 * 4 * 20});
+    EXPECT_EQ(play("close").status, 0); // is no failure
+    const HostResult failed = play("fail");
+    EXPECT_EQ(failed.status, 1);
+    EXPECT_THAT(failed.error, HasSubstr("ffplay stopped: no window"));
+    const HostResult real = play("");
+    EXPECT_EQ(real.status, 0) << real.error;
+}
+
+TEST_F(FootageTest, PreviewsAreSmallAndKeepTheirTimes) {
+    Make(std::string("-f lavfi -i testsrc=s=1280x722:r=25:d=0.2 -c:v ffv1"), "in.mkv");
+    Pass("in.mkv", "out.mp4", {"--preview"});
+    const json stream = Probe("out.mp4")["streams"][0];
+    EXPECT_EQ(stream["height"], 360);
+    EXPECT_EQ(stream["width"], 636); // 1280 * 360 / 722, a multiple of four
+    EXPECT_EQ(Times("out.mp4"), Times("in.mkv"));
+}
+
 TEST_F(FootageTest, JobsChangeNoByte) {
     Make("-f lavfi -i testsrc2=s=96x54:r=25:d=1 -c:v ffv1", "a.mkv");
     Make("-f lavfi -i testsrc=s=96x54:r=25:d=1 -c:v ffv1", "b.mkv");
