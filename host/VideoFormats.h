@@ -31,7 +31,7 @@ struct Container {
     const char* soundCodec = nullptr;     // what others become
     std::vector<const char*> subtitles{}; // codecs that are copied
     const char* textCodec = nullptr;      // what other subtitles of text become
-    bool covers = false, attachments = false, chapters = false;
+    bool covers = false, attachments = false, chapters = false, titles = true;
     Times times = Times::Any;
 };
 

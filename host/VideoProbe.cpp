@@ -212,6 +212,9 @@ VideoInfo ParseProbe(const MediaInput& input, const json& probe) {
                   : order == "bb" || order == "bt" ? FieldOrder::BottomFirst
                                                    : FieldOrder::Progressive;
     info.hdrMetadata = HdrMetadata(*video);
+    if (const auto tags = format.find("tags"); tags != format.end()) {
+        info.hasTitle = !Text(*tags, "title", Text(*tags, "TITLE")).empty();
+    }
     info.chapters = probe.value("chapters", json::array()).size();
     return info;
 }
@@ -330,9 +333,13 @@ MediaInput OpenMedia(const fs::path& file, const RawInput& raw) {
     return input;
 }
 
-VideoInfo ProbeVideo(const VideoTools& tools, const MediaInput& input) {
-    std::vector<std::string> arguments = {
-        "-v", "error", "-print_format", "json", "-show_streams", "-show_format", "-show_chapters"};
+namespace {
+
+// What ffprobe tells when it is asked for something.
+json Probed(const VideoTools& tools, const MediaInput& input,
+            const std::vector<std::string>& asked) {
+    std::vector<std::string> arguments = {"-v", "error", "-print_format", "json"};
+    arguments.insert(arguments.end(), asked.begin(), asked.end());
     arguments.insert(arguments.end(), input.options.begin(), input.options.end());
     arguments.insert(arguments.end(), {"-i", input.Argument()});
     const auto probe =
@@ -352,8 +359,35 @@ VideoInfo ProbeVideo(const VideoTools& tools, const MediaInput& input) {
         Unreadable(input, "this is no picture or video that can be read (" +
                               probe->LastLineAbout(input.Argument()) + ")");
     }
+    return json::parse(text);
+}
+
+// Streams tell the order of fields in the words of their format, which for some is but a guess;
+// frames know.
+FieldOrder OrderOfFirstFrame(const VideoTools& tools, const MediaInput& input,
+                             const VideoInfo& info) {
+    const json probe =
+        Probed(tools, input,
+               {"-select_streams", std::to_string(info.streamIndex), "-read_intervals", "%+#1",
+                "-show_entries", "frame=interlaced_frame,top_field_first"});
+    const json frames = probe.value("frames", json::array());
+    if (frames.empty() || frames.front().value("interlaced_frame", 0) == 0) {
+        return info.fields;
+    }
+    return frames.front().value("top_field_first", 0) != 0 ? FieldOrder::TopFirst
+                                                           : FieldOrder::BottomFirst;
+}
+
+} // namespace
+
+VideoInfo ProbeVideo(const VideoTools& tools, const MediaInput& input) {
     try {
-        return ParseProbe(input, json::parse(text));
+        VideoInfo info = ParseProbe(
+            input, Probed(tools, input, {"-show_streams", "-show_format", "-show_chapters"}));
+        if (info.fields != FieldOrder::Progressive && !input.pipe) {
+            info.fields = OrderOfFirstFrame(tools, input, info);
+        }
+        return info;
     } catch (const json::exception&) {
         Unreadable(input, tools.Companion("ffprobe") +
                               " describes it in no way that this host understands");

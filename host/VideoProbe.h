@@ -90,6 +90,7 @@ struct VideoInfo {
     std::vector<std::pair<std::string, std::string>> tags; // of the stream: language, title, ...
     std::vector<StreamInfo> others;                        // in the file's order
     size_t chapters = 0;
+    bool hasTitle = false; // of the whole file
 
     std::vector<std::string> AudioCodecs() const; // in order
 };

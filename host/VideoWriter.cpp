@@ -52,6 +52,11 @@ public:
         : m_format(format), m_container(*format.container), m_info(format.carried->info) {}
 
     Plan Make() {
+        if (m_info.hasTitle && (!m_container.titles || m_format.carried->input.pipe)) {
+            m_plan.losses.push_back("the title is left out: " +
+                                    (m_container.titles ? "it does not go through a pipe"
+                                                        : Ending(m_format) + " has none"));
+        }
         if (m_format.carried->input.pipe) { // nobody can read it a second time
             for (const StreamInfo& stream : m_info.others) {
                 Lose(stream, "does not go through a pipe");

@@ -157,6 +157,12 @@ TEST_F(FootageTest, FieldsAreRenderedEachOnItsOwn) {
     EXPECT_EQ(Frames("plain.mkv"), Frames("tff.mkv"));
     EXPECT_EQ(Probe("plain.mkv")["streams"][0].value("field_order", ""), "tb");
 
+    // The stream says "tt" here, which is a guess; its frames know better.
+    Make("-f lavfi -i testsrc=s=64x36:r=25:d=0.2 -vf setfield=bff -c:v libx264 -flags +ilme+ildct",
+         "bff.ts");
+    Pass("bff.ts", "bff.mkv", {"--codec", "ffv1"});
+    EXPECT_EQ(Probe("bff.mkv")["streams"][0].value("field_order", ""), "bt");
+
     const HostResult blurred = RunHost({"render", "dreamy", Path("tff.mkv"), Path("blurred.mkv"),
                                         "--codec", "ffv1", "--set", "P1=10"});
     EXPECT_EQ(blurred.status, 0) << blurred.error;
@@ -201,6 +207,7 @@ TEST_F(FootageTest, WhatGoesWithThePicturesIsKeptOrSaid) {
     EXPECT_THAT(said, HasSubstr("a sound (pcm_s16le), is left out: it does not go into .gif"));
     EXPECT_THAT(said, HasSubstr("a subtitle track (subrip), is left out"));
     EXPECT_THAT(said, HasSubstr("the chapters are left out"));
+    EXPECT_THAT(said, HasSubstr("the title is left out: .gif has none"));
 }
 
 TEST_F(FootageTest, OddSizesStayWhereTheCodecCan) {
