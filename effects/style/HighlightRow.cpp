@@ -13,7 +13,7 @@ void HighlightRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
         const uint32_t b = src[0];
         const uint32_t g = src[1];
         const uint32_t r = src[2];
-        const uint32_t brightness = (StyleLuma(b, g, r) + std::max({b, g, r}) + 1) >> 1;
+        const uint32_t brightness = StyleBrightness(b, g, r);
         const uint32_t above = brightness > highlight.floor ? brightness - highlight.floor : 0;
         const uint32_t weight = std::min((above * highlight.slope) >> 4, 255U);
         const uint32_t square = StyleProduct(weight, weight);

@@ -8,8 +8,7 @@
 
 namespace kyv {
 
-// A pixel's brightness is the rounded mean of its luma and its strongest channel, so that coloured
-// lights count too.
+// By StyleBrightness.
 struct Highlight {
     uint8_t floor;  // what is not brighter becomes black; 0..254
     uint16_t slope; // rise of the weight above the floor, in 1/16: (brightness - floor) * slope

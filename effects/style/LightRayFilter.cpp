@@ -12,8 +12,8 @@
 namespace kyv {
 namespace {
 
-// Only what is well above middle grey sends out light.
-constexpr Highlight kLights = {.floor = 140, .slope = 38};
+// What is darker sends out no light in any picture.
+constexpr uint32_t kLowestLight = 56;
 
 // The small picture's width is at most this. Shafts are soft, and their steps cost in proportion.
 constexpr int32_t kWidestSmall = 512;
@@ -26,7 +26,10 @@ constexpr int32_t kMostSteps = 9;
 constexpr float kFarEnd = 0.05F;
 
 // In 8 bits. The brightest shafts leave some of the picture's room, so that it shows through.
-constexpr float kFullLight = 204.0F;
+constexpr float kFullLight = 230.0F;
+
+// The share of the picture that the strongest shafts may take.
+constexpr float kStrongest = 0.02F;
 
 constexpr uint32_t kMostBands = 64;
 
@@ -66,9 +69,9 @@ float Noise(float x, float y) {
 float Passing(float dx, float dy) {
     const float broad = Noise(dx * 6.0F + 40.0F, dy * 6.0F + 40.0F);
     const float fine = Noise(dx * 19.0F + 90.0F, dy * 19.0F + 90.0F);
-    const float level = std::clamp(0.62F * broad + 0.38F * fine, 0.0F, 1.0F);
-    const float contrast = std::clamp((level - 0.28F) * 2.3F, 0.0F, 1.0F);
-    return 0.25F + 0.75F * contrast * contrast * (3.0F - 2.0F * contrast);
+    const float level = 0.55F * broad + 0.45F * fine;
+    const float contrast = std::clamp((level - 0.36F) * 2.6F, 0.0F, 1.0F);
+    return 0.04F + 0.96F * contrast * contrast;
 }
 
 // Where a coordinate of the small picture comes from when it is zoomed about the light.
@@ -176,27 +179,22 @@ void CLightRayFilter::PrepareStep(float zoom) {
     }
 }
 
-// Highlights, reduced, with shadows.
 void CLightRayFilter::Gather(const StyleFrame& frame, int32_t first, int32_t end, BandRows& rows) {
-    const HighlightRow highlight = kHighlightRow.For(m_set);
     const int32_t side = 1 << m_small.GetBits();
     const int32_t last = std::min(end * side, frame.height);
     for (int32_t y = std::min(first * side, last); y < last; ++y) {
-        const uint8_t* row = frame.Load(y, rows.source.data());
-        highlight(rows.result.data(), row, static_cast<size_t>(frame.width), kLights);
-        m_small.TakeRow(y, rows.result.data(), rows.small);
+        m_small.TakeRow(y, frame.Load(y, rows.source.data()), rows.small);
     }
 }
 
+// The lights alone, with shadows.
 void CLightRayFilter::Shade(int32_t first, int32_t end) {
-    const int32_t width = m_small.GetImage().GetWidth();
+    const auto width = static_cast<size_t>(m_small.GetImage().GetWidth());
     for (int32_t row = first; row < end; ++row) {
-        const uint8_t* pixels = m_small.GetImage().Row(row);
-        const uint16_t* shadows = m_shadows.data() + static_cast<size_t>(row) * width;
-        uint16_t* light = LightRow(m_light, row);
-        for (int32_t i = 0; i < width * 4; ++i) {
-            light[i] = static_cast<uint16_t>((pixels[i] * 257U * shadows[i >> 2]) >> 16);
-        }
+        uint8_t* pixels = m_small.GetImage().Row(row);
+        kHighlightRow.For(m_set)(pixels, pixels, width, m_lights);
+        kRayShadeRow.For(m_set)(LightRow(m_light, row), pixels,
+                                m_shadows.data() + static_cast<size_t>(row) * width, width);
     }
 }
 
@@ -211,20 +209,49 @@ void CLightRayFilter::Step(int32_t first, int32_t end, BandRows& rows) {
     }
 }
 
-// Back to 8 bits, with the gain and a shoulder that never clips: x / (1 + x).
+// The gain that brings the strongest shafts to the wanted strength, with a shoulder that never
+// clips: x / (1 + x).
+void CLightRayFilter::PrepareFinish(float strength) {
+    uint32_t counts[kLightLevels] = {};
+    uint32_t total = 0;
+    const int32_t width = m_small.GetImage().GetWidth();
+    for (int32_t y = 0; y < m_small.GetImage().GetHeight(); y += 2) {
+        const uint16_t* light = LightRow(m_light, y);
+        for (int32_t x = 0; x < width; x += 2, light += 8) {
+            ++counts[std::max({light[0], light[1], light[2]}) * kLightLevels >> 16];
+            ++total;
+        }
+    }
+    const auto wanted = static_cast<uint32_t>(kStrongest * static_cast<float>(total));
+    uint32_t level = kLightLevels - 1;
+    for (uint32_t count = counts[level]; count <= wanted && level > 0; count += counts[level]) {
+        --level;
+    }
+    const float strongest = (static_cast<float>(level) + 1.0F) / kLightLevels;
+    // The strongest shafts grow by the same amount with every degree.
+    const float target = 0.10F + 0.72F * strength;
+    // Few and small lights are not to become searchlights. Longer shafts are the more diluted.
+    const float most = 8.0F + 40.0F * strength;
+    const float gain = std::min(target / (1.0F - target) / strongest, most);
+    for (uint32_t i = 0; i < kLightLevels; ++i) {
+        const float reached = (static_cast<float>(i) + 0.5F) / kLightLevels * gain;
+        m_factors[i] = static_cast<uint16_t>(
+            RoundHalfUp(std::min(kFullLight * gain / (1.0F + reached) * 16.0F, 65535.0F)));
+    }
+}
+
+// Back to 8 bits. One factor for all channels keeps the hue.
 void CLightRayFilter::Finish(int32_t first, int32_t end) {
     const int32_t width = m_small.GetImage().GetWidth();
-    const float gain = m_gain / 65535.0F;
     for (int32_t row = first; row < end; ++row) {
         const uint16_t* light = LightRow(m_light, row);
         uint8_t* pixels = m_small.GetImage().Row(row);
         for (int32_t i = 0; i < width * 4; i += 4) {
-            // One factor for all channels keeps the hue.
-            const float strongest = std::max({light[i], light[i + 1], light[i + 2]});
-            const float factor = kFullLight * gain / (1.0F + strongest * gain);
+            const uint32_t strongest = std::max({light[i], light[i + 1], light[i + 2]});
+            const uint32_t factor = m_factors[strongest * kLightLevels >> 16];
             for (int32_t c = i; c < i + 4; ++c) {
                 pixels[c] =
-                    static_cast<uint8_t>(RoundHalfUp(static_cast<float>(light[c]) * factor));
+                    static_cast<uint8_t>(std::min((light[c] * factor + (1U << 19)) >> 20, 255U));
             }
         }
     }
@@ -254,6 +281,8 @@ void CLightRayFilter::Render(const StyleFrame& frame, uint32_t degree, float x, 
     const int32_t height = m_small.GetImage().GetHeight();
     InBands(height,
             [&](int32_t first, int32_t end, BandRows& rows) { Gather(frame, first, end, rows); });
+    m_tones.Count(m_small.GetImage());
+    m_lights = LightsOf(m_tones, kLowestLight);
     InBands(height, [&](int32_t first, int32_t end, BandRows&) { Shade(first, end); });
 
     // The light of the far end comes from this near to the light's place.
@@ -270,7 +299,6 @@ void CLightRayFilter::Render(const StyleFrame& frame, uint32_t degree, float x, 
     }
     float zoom = Root(reach, steps);
     float decay = Root(kFarEnd, steps);
-    m_gain = 1.5F + 9.0F * strength;
     for (; steps > 0; --steps, zoom *= zoom, decay *= decay) {
         PrepareStep(zoom);
         m_brought = static_cast<uint16_t>(decay / (1.0F + decay) * 65536.0F);
@@ -279,6 +307,7 @@ void CLightRayFilter::Render(const StyleFrame& frame, uint32_t degree, float x, 
                 [&](int32_t first, int32_t end, BandRows& rows) { Step(first, end, rows); });
         m_light.swap(m_next);
     }
+    PrepareFinish(strength);
     InBands(height, [&](int32_t first, int32_t end, BandRows&) { Finish(first, end); });
     const int32_t rowCount = (frame.height - frame.firstRow + frame.rowStep - 1) / frame.rowStep;
     if (rowCount > 0) {

@@ -1,11 +1,14 @@
 // The shafts of the light ray effect.
 //
-// The picture's highlights, at a fraction of its size, are what sends out light. Each pixel is to
+// The picture's lights, at a fraction of its size, are what sends out light; how bright a light is
+// goes with the picture, so that a dull sky has shafts too. Each pixel is to
 // get the mean of all light on its way to the light's place, the farther the less. Instead of
 // walking that way, every step adds to the picture a copy of itself that is zoomed about the
 // light's place, and the next step's zoom is the square of this one's, so that n steps gather 2^n
-// places. Faint shadows that turn with the angle around the light break an even glow into shafts,
-// as dust and haze do. The result is added within the room that each pixel leaves.
+// places. Shadows that turn with the angle around the light break an even glow into shafts, as
+// leaves and clouds do. How much light that gives depends on the picture, so it is brought to the
+// strength that the degree asks for, within bounds, and added within the room that each pixel
+// leaves.
 #pragma once
 
 #include <cstdint>
@@ -14,6 +17,7 @@
 
 #include "effects/style/SmallPicture.h"
 #include "effects/style/StyleFrame.h"
+#include "effects/style/Tones.h"
 #include "threading/ThreadPool.h"
 
 namespace kyv {
@@ -26,6 +30,8 @@ public:
     void Render(const StyleFrame& frame, uint32_t degree, float x, float y, uint32_t threads);
 
 private:
+    static constexpr uint32_t kLightLevels = 1024;
+
     // What one band of rows works with.
     struct BandRows {
         SmallPictureRows small;
@@ -45,6 +51,7 @@ private:
     void Gather(const StyleFrame& frame, int32_t first, int32_t end, BandRows& rows);
     void Shade(int32_t first, int32_t end);
     void Step(int32_t first, int32_t end, BandRows& rows);
+    void PrepareFinish(float strength);
     void Finish(int32_t first, int32_t end);
     void Compose(const StyleFrame& frame, int32_t first, int32_t end, BandRows& rows) const;
 
@@ -61,7 +68,10 @@ private:
     int32_t m_shadowHeight = 0;
     float m_lightX = 0.0F; // in small pixels
     float m_lightY = 0.0F;
-    float m_gain = 0.0F;
+
+    CTones m_tones;
+    Highlight m_lights = {};
+    uint16_t m_factors[kLightLevels] = {}; // of the light, by its strongest channel, to 8 bits
 
     // Of the step at hand: where the row and the columns come from.
     struct Source {

@@ -12,6 +12,16 @@ inline Vec Between(Vec a, Vec b, Vec fraction) {
 
 } // namespace
 
+void RayShadeRow(uint16_t* dst, const uint8_t* src, const uint16_t* shadows, size_t count) {
+    size_t i = 0;
+    for (; i + kLongs <= count; i += kLongs) {
+        const Vec pixels = LoadBytes16(src + i * 4);
+        const Vec light = Or(pixels, ShiftLeft16<8>(pixels));
+        Store(dst + i * 4, MulHighU16(light, LoadWords64(shadows + i)));
+    }
+    RayShadeRow_scalar(dst + i * 4, src + i * 4, shadows + i, count - i);
+}
+
 void RayLerpRow(uint16_t* dst, const uint16_t* upper, const uint16_t* lower, size_t count,
                 uint16_t fraction) {
     const Vec way = Splat16(fraction);
@@ -49,9 +59,11 @@ void RayAddRow(uint8_t* dst, const uint8_t* src, const uint8_t* light, size_t co
         const Words spread = Spread(Strongest(pixels));
         const Vec all = PackU16(spread.low, spread.high);
         const Words room = Widen(Xor(AverageU8(pixels, all), Splat8(255)));
+        const Words taken = Widen(AddSatU8(AddSatU8(all, all), Splat8(kBlackTakes)));
         const Words add = Widen(Load(light + i * 4));
-        const Vec sum =
-            AddSatU8(pixels, PackU16(Product(add.low, room.low), Product(add.high, room.high)));
+        const Vec low = Product(Product(add.low, taken.low), room.low);
+        const Vec high = Product(Product(add.high, taken.high), room.high);
+        const Vec sum = AddSatU8(pixels, PackU16(low, high));
         Store(dst + i * 4, WithAlphaOf(pixels, sum));
     }
     RayAddRow_scalar(dst + i * 4, src + i * 4, light + i * 4, count - i);

@@ -1,6 +1,7 @@
 // Small fixed-point rules that the scalar kernels of the style effects share.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 
 namespace kyv {
@@ -8,6 +9,12 @@ namespace kyv {
 // The luma of full-range B, G, R, 0..255, rounded. The weights sum to 256.
 constexpr uint32_t StyleLuma(uint32_t b, uint32_t g, uint32_t r) {
     return (29 * b + 150 * g + 77 * r + 128) >> 8;
+}
+
+// How much a pixel shines: the rounded mean of its luma and its strongest channel, so that coloured
+// lights count too.
+constexpr uint32_t StyleBrightness(uint32_t b, uint32_t g, uint32_t r) {
+    return (StyleLuma(b, g, r) + std::max({b, g, r}) + 1) >> 1;
 }
 
 // a and b mixed by a weight of 0..256, rounded; all of it fits 16 bits.

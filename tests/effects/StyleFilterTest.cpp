@@ -1,5 +1,6 @@
 // What the style filters promise, through the callbacks.
 #include <algorithm>
+#include <array>
 #include <cstdlib>
 #include <functional>
 #include <limits>
@@ -73,7 +74,7 @@ INSTANTIATE_TEST_SUITE_P(All, StyleFilter,
 TEST_P(StyleFilter, BytesAreTheSameInEveryBuild) {
     const std::map<std::string, uint64_t> expected = {
         {"Kyv_Dsp_Vi_Dreamy", 0x4539697EEBD16510},
-        {"Kyv_Dsp_Vi_LightRay", 0x7898AEC2848E3546},
+        {"Kyv_Dsp_Vi_LightRay", 0x1F6466D5FD76A047},
         {"Dsp_Vi_PencilSketch2", 0xCE6F71D14EC68B07},
     };
     uint64_t hash = 0xCBF29CE484222325; // FNV-1a
@@ -257,25 +258,59 @@ TEST(LightRay, StreamsAwayFromItsPlaceAndOnlyBrightens) {
     EXPECT_EQ(render(30, kNan, kNan), render(30, 0.0F, 0.0F));
     EXPECT_EQ(render(30, kInf, -kInf), render(30, 16.0F, -16.0F));
 
-    // From the left the block's light falls to the right, from the right to the left.
+    // From the right the block's light falls to the left, from the left to the right. Over all of
+    // its rows, since dark gaps lie between the shafts.
     const auto gain = [&](const Frame& frame, uint32_t x) {
-        return static_cast<int>(frame[size_t{45} * kWidth + x] & 255) - 0x20;
+        int sum = 0;
+        for (uint32_t row = 36; row < 54; ++row) {
+            sum += static_cast<int>(frame[size_t{row} * kWidth + x] & 255) - 0x20;
+        }
+        return sum;
     };
-    const Frame fromLeft = render(30, 0.0F, 0.5F);
-    EXPECT_GT(gain(fromLeft, 95), 10);
-    EXPECT_GT(gain(fromLeft, 95), gain(fromLeft, 130));
-    EXPECT_GT(gain(fromLeft, 130), 0);
-    EXPECT_EQ(gain(fromLeft, 55), 0);
-    EXPECT_GT(gain(render(5, 0.0F, 0.5F), 88), 0);
-    EXPECT_LT(gain(render(5, 0.0F, 0.5F), 95), gain(fromLeft, 95));
-    const Frame fromRight = render(30, 1.2F, 0.5F);
-    EXPECT_GT(gain(fromRight, 55), 10);
-    EXPECT_EQ(gain(fromRight, 110), 0);
+    const Frame fromRight = render(30, 1.0F, 0.5F);
+    EXPECT_GT(gain(fromRight, 64), 180);
+    EXPECT_GT(gain(fromRight, 64), gain(fromRight, 8));
+    EXPECT_GT(gain(fromRight, 8), 0);
+    EXPECT_EQ(gain(fromRight, 104), 0);
+    EXPECT_GT(gain(render(5, 1.0F, 0.5F), 71), 0);
+    EXPECT_LT(gain(render(5, 1.0F, 0.5F), 64), gain(fromRight, 64));
+    const Frame fromLeft = render(30, -0.2F, 0.5F);
+    EXPECT_GT(gain(fromLeft, 104), 50);
+    EXPECT_EQ(gain(fromLeft, 49), 0);
     for (size_t i = 0; i < input.size(); ++i) {
         for (int c = 0; c < 24; c += 8) {
-            ASSERT_GE(fromLeft[i] >> c & 255, input[i] >> c & 255) << i;
+            ASSERT_GE(fromRight[i] >> c & 255, input[i] >> c & 255) << i;
         }
     }
+}
+
+TEST(LightRay, ShaftsComeFromWhatIsBrightInItsPictureAndSpareDarkForegrounds) {
+    constexpr uint32_t kWidth = 160, kHeight = 90;
+    // A sky over a black bar at x = 100 and a ground, from the top: once bright, once dull.
+    const auto gains = [&](uint32_t sky, uint32_t ground) {
+        Frame input(size_t{kWidth} * kHeight, 0xFF000000 | ground * 0x10101);
+        std::fill_n(input.begin(), kWidth * 30, 0xFF000000 | sky * 0x10101);
+        for (uint32_t y = 30; y < kHeight; ++y) {
+            std::fill_n(&input[size_t{y} * kWidth + 60], 40, 0xFF000000);
+        }
+        const Frame lit = Render("Kyv_Dsp_Vi_LightRay", input, kWidth, [&](CTestInstance& light) {
+            light.Set("P1", uint8_t{30});
+            light.Set("P2", std::pair{0.5F, -0.5F});
+        });
+        std::array<uint32_t, 2> sums = {}; // on the ground left of the bar, and on the bar
+        for (uint32_t y = 30; y < 60; ++y) {
+            for (uint32_t x = 30; x < 100; ++x) {
+                const size_t i = size_t{y} * kWidth + x;
+                sums[x >= 60] += (lit[i] & 255) - (input[i] & 255);
+            }
+        }
+        return std::array{sums[0] / (30 * 30), sums[1] / (30 * 40)};
+    };
+    const auto [bright, onBar] = gains(230, 90);
+    EXPECT_GT(bright, 10U);
+    EXPECT_LT(onBar, bright / 2);
+    EXPECT_GT(gains(110, 50)[0], 10U) << "a dull sky is the light of a dull picture";
+    EXPECT_EQ(gains(40, 20)[0], 0U) << "the dark sends out none";
 }
 
 TEST(PencilSketch, DrawsContoursAndDarkerToneOnPaper) {

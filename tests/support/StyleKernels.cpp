@@ -74,6 +74,15 @@ std::vector<uint16_t> LightOf(const uint8_t* bytes, size_t count) {
     return WordsOf(bytes, count, 65535);
 }
 
+auto BindRayShade(uint32_t) {
+    return [](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
+        const auto shadows = LightOf(src[1], count);
+        std::vector<uint16_t> result(count * 4);
+        form(result.data(), src[0], shadows.data(), count);
+        std::copy_n(reinterpret_cast<const uint8_t*>(result.data()), count * 8, dst);
+    };
+}
+
 auto BindRayLerp(uint32_t seed) {
     const uint16_t fraction = seed % 4 == 0   ? 0
                               : seed % 4 == 1 ? 65535
@@ -154,6 +163,9 @@ void AddStyle(std::vector<KernelEntry>& list) {
                             return [](auto form, uint8_t* dst, const uint8_t* const* src,
                                       size_t count) { form(dst, src[0], src[1], src[2], count); };
                         }));
+    list.push_back(Rows(kyv::kRayShadeRow,
+                        {.table = "kRayShadeRow", .dstBytes = 8, .sourceBytes = {4, 2}},
+                        BindRayShade));
     list.push_back(Rows(kyv::kRayLerpRow,
                         {.table = "kRayLerpRow", .dstBytes = 2, .sourceBytes = {2, 2}},
                         BindRayLerp));
