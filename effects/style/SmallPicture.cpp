@@ -30,15 +30,12 @@ struct Place {
     int32_t fraction;
 };
 
-// A blur this many small pixels wide shows nothing of the pixels' squares.
-constexpr float kLeastSigma = 2.0F;
-
 } // namespace
 
-int32_t ChooseShrinkBits(int32_t width, float sigma, int32_t widest) {
+int32_t ChooseShrinkBits(int32_t width, float sigma, int32_t widest, float leastSigma) {
     int32_t bits = 0;
     while (bits < kMostShrinkBits &&
-           ((width >> bits) > widest || sigma >= kLeastSigma * static_cast<float>(2 << bits))) {
+           ((width >> bits) > widest || sigma >= leastSigma * static_cast<float>(2 << bits))) {
         ++bits;
     }
     return bits;

@@ -11,9 +11,10 @@
 
 namespace kyv {
 
-// How far a picture may shrink for a blur of a standard deviation in pixels: as far as it forgives,
-// and at least until it is not wider than the given width, which bounds the work.
-int32_t ChooseShrinkBits(int32_t width, float sigma, int32_t widest);
+// How far a picture may shrink for a blur of a standard deviation in pixels: as long as that is
+// leastSigma small pixels, and at least until it is not wider than the given width, which bounds
+// the work.
+int32_t ChooseShrinkBits(int32_t width, float sigma, int32_t widest, float leastSigma = 2.0F);
 
 // Working rows, one set a thread.
 struct SmallPictureRows {

@@ -73,7 +73,7 @@ INSTANTIATE_TEST_SUITE_P(All, StyleFilter,
 // either target, to the same bytes. A change that is meant to show needs new numbers here.
 TEST_P(StyleFilter, BytesAreTheSameInEveryBuild) {
     const std::map<std::string, uint64_t> expected = {
-        {"Kyv_Dsp_Vi_Dreamy", 0x4539697EEBD16510},
+        {"Kyv_Dsp_Vi_Dreamy", 0x61B8A39198D3563F},
         {"Kyv_Dsp_Vi_LightRay", 0x1F6466D5FD76A047},
         {"Dsp_Vi_PencilSketch2", 0xCE6F71D14EC68B07},
     };
@@ -311,6 +311,25 @@ TEST(LightRay, ShaftsComeFromWhatIsBrightInItsPictureAndSpareDarkForegrounds) {
     EXPECT_LT(onBar, bright / 2);
     EXPECT_GT(gains(110, 50)[0], 10U) << "a dull sky is the light of a dull picture";
     EXPECT_EQ(gains(40, 20)[0], 0U) << "the dark sends out none";
+}
+
+TEST(Dreamy, DeepShadowsHoldBesideALight) {
+    constexpr uint32_t kSize = 120;
+    Frame input(kSize * kSize, 0xFF101010);
+    for (uint32_t y = 0; y < kSize; ++y) {
+        std::fill_n(&input[y * kSize + 60], 60, 0xFFFFE0C0);
+    }
+    for (const uint8_t degree : {5, 20, 40}) {
+        const Frame glow = Render("Kyv_Dsp_Vi_Dreamy", input, kSize,
+                                  [&](CTestInstance& instance) { instance.Set("P1", degree); });
+        // Black does not rise far from the light and little beside it, and the light keeps its own
+        // strength and colour.
+        EXPECT_LE(glow[60 * kSize + 4] & 255, 0x10U);
+        EXPECT_LE(glow[60 * kSize + 57] & 255, 0x10U + 80);
+        const uint32_t light = glow[60 * kSize + 110];
+        EXPECT_GE(light >> 16 & 255, 250U);
+        EXPECT_NEAR(light & 255, 0xC0, 24);
+    }
 }
 
 TEST(PencilSketch, DrawsContoursAndDarkerToneOnPaper) {

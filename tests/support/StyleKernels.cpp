@@ -57,15 +57,14 @@ auto BindHighlight(uint32_t seed) {
     };
 }
 
-auto BindDreamy(uint32_t seed) {
+auto BindVeil(uint32_t seed) {
     std::mt19937 random(seed);
-    const kyv::DreamyMix mix = seed % 4 == 0
-                                   ? kyv::DreamyMix{256, 256, 256}
-                                   : kyv::DreamyMix{static_cast<uint16_t>(random() % 257),
-                                                    static_cast<uint16_t>(random() % 257),
-                                                    static_cast<uint16_t>(random() % 257)};
+    const auto share = [&](uint32_t least) {
+        return static_cast<uint16_t>(seed % 4 == 0 ? 256 : least + random() % (257 - least));
+    };
+    const kyv::DreamyMix mix = {.soft = share(1), .glow = share(0), .depth = share(0)};
     return [mix](auto form, uint8_t* dst, const uint8_t* const* src, size_t count) {
-        form(dst, src[0], src[1], src[2], count, mix);
+        form(dst, src[0], src[1], count, mix);
     };
 }
 
@@ -154,9 +153,15 @@ void AddStyle(std::vector<KernelEntry>& list) {
     list.push_back(Rows(kyv::kHighlightRow,
                         {.table = "kHighlightRow", .inPlace = true, .inputBits = {24}},
                         BindHighlight));
+    list.push_back(Rows(kyv::kDreamyVeilRow,
+                        {.table = "kDreamyVeilRow", .inPlace = true, .sourceBytes = {4, 4}},
+                        BindVeil));
     list.push_back(Rows(kyv::kDreamyRow,
-                        {.table = "kDreamyRow", .inPlace = true, .sourceBytes = {4, 4, 4}},
-                        BindDreamy));
+                        {.table = "kDreamyRow", .inPlace = true, .sourceBytes = {4, 4}},
+                        [](uint32_t) {
+                            return [](auto form, uint8_t* dst, const uint8_t* const* src,
+                                      size_t count) { form(dst, src[0], src[1], count); };
+                        }));
     list.push_back(Rows(kyv::kMaskMixRow,
                         {.table = "kMaskMixRow", .inPlace = true, .sourceBytes = {4, 4, 1}},
                         [](uint32_t) {
