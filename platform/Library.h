@@ -44,7 +44,8 @@ bool FileExists(const NativeString& path);
 // The file name of a library: "Name.dll" on Windows, "libName.so" on Linux.
 NativeString SharedLibraryName(const char* name);
 
-// Null when the library cannot be loaded. A bare file name is looked for where the system looks.
+// Null when the library cannot be loaded, its file cut short included. A bare file name is looked
+// for where the system looks.
 LibraryHandle OpenLibrary(const NativeString& path);
 
 // Null is allowed and does nothing.

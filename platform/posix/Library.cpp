@@ -4,11 +4,14 @@
 #include <array>
 #include <cstdint>
 #include <cstdlib>
+#include <cstring>
 #include <string_view>
 
 #include <dlfcn.h>
+#include <fcntl.h>
 #include <link.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 namespace kyv {
 namespace {
@@ -165,8 +168,38 @@ NativeString SharedLibraryName(const char* name) {
     return "lib" + std::string(name) + ".so";
 }
 
+namespace {
+
+// The loader maps what a library's headers name and reads it, and a page beyond the file's end ends
+// the process. So a file that lost its end, on a full disk say, is found out before. What is no
+// library at all is left to the loader, and so is a bare name, which it searches for.
+bool LacksItsEnd(const NativeString& path) {
+    const int file = path.find('/') == NativeString::npos ? -1 : open(path.c_str(), O_RDONLY);
+    if (file < 0) {
+        return false;
+    }
+    struct stat attributes;
+    ElfW(Ehdr) header;
+    bool lacks = false;
+    if (fstat(file, &attributes) == 0 && S_ISREG(attributes.st_mode) &&
+        pread(file, &header, sizeof header, 0) == sizeof header &&
+        std::memcmp(header.e_ident, ELFMAG, SELFMAG) == 0) {
+        const auto size = static_cast<uint64_t>(attributes.st_size);
+        for (uint32_t i = 0; i < header.e_phnum && !lacks; ++i) {
+            ElfW(Phdr) part;
+            const auto at = static_cast<off_t>(header.e_phoff + i * sizeof part);
+            lacks = pread(file, &part, sizeof part, at) != sizeof part || part.p_offset > size ||
+                    part.p_filesz > size - part.p_offset;
+        }
+    }
+    close(file);
+    return lacks;
+}
+
+} // namespace
+
 LibraryHandle OpenLibrary(const NativeString& path) {
-    return dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
+    return LacksItsEnd(path) ? nullptr : dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
 }
 
 void CloseLibrary(LibraryHandle library) {
