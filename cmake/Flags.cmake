@@ -28,6 +28,8 @@ endif()
 if(WIN32)
     # The product needs nothing but system libraries.
     add_link_options(-static)
+    # The same sources make the same bytes.
+    add_link_options(-Wl,--no-insert-timestamp)
 endif()
 
 # Pixels must have the same bytes on both targets: no contraction into fused operations.

@@ -33,8 +33,8 @@ fs::path ModuleFile() {
         return kyvhosting::PathOf(named);
     }
     const fs::path folder = fs::path(kyv::LibraryFileName(kyv::OwnLibrary())).parent_path();
-    fs::path file = kyvhosting::FindModuleFile(
-        {folder, folder / "..", folder / "../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)});
+    fs::path file = kyvhosting::FindModuleFile({folder, folder / "..", folder / "../../../module",
+                                                folder / kyvhosting::PathOf(KYV_MODULE_FOLDER)});
     if (file.empty()) {
         throw kyvhosting::CModuleError(
             "no " KYV_MODULE_NAME " beside the plug-in in " + kyvhosting::TextOf(folder) +

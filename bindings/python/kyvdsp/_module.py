@@ -23,11 +23,12 @@ def _candidates() -> List[Path]:
     if named:
         return [Path(named)]
     here = Path(__file__).resolve().parent
-    folders = [here, here.parent.parent.parent / "module"]  # a wheel, the build tree
+    folders = [here, here.parents[2] / "module"]  # a wheel, the build tree
     if not _WINDOWS:
         multiarch = getattr(sys.implementation, "_multiarch", "")
-        for prefix in (Path(sys.prefix), Path("/usr/local"), Path("/usr")):
-            folders += [prefix / "lib" / multiarch / "kyvdsp", prefix / "lib" / "kyvdsp"]
+        # Installed with this package, elsewhere on the system.
+        for libraries in (here.parents[2], Path("/usr/local/lib"), Path("/usr/lib")):
+            folders += [libraries / multiarch / "kyvdsp", libraries / "kyvdsp"]
     return [folder / _FILE_NAME for folder in folders]
 
 
