@@ -2,7 +2,9 @@
 #include "hosting/Names.h"
 
 #include <algorithm>
+#include <atomic>
 #include <charconv>
+#include <utility>
 
 #include "hosting/Error.h"
 #include "hosting/Suggest.h"
@@ -89,7 +91,47 @@ std::string NameOfKey(const EffectDescriptor& effect) {
     return family == "Pi" ? bare + " picture-in-picture" : bare;
 }
 
+// Of UseTextsBeside.
+std::atomic<KyvLanguageTextFunction> g_textsBeside = nullptr;
+
 } // namespace
+
+void UseTextsBeside(const std::filesystem::path& module) {
+    const auto english = std::filesystem::path("ENU").native();
+    for (const kyv::NativeString& language : {kyv::AbbreviatedLanguageName(), english}) {
+        if (g_textsBeside.load()) {
+            return;
+        }
+        std::filesystem::path file = module.parent_path() / module.stem();
+        file += "_";
+        file += language;
+        file += ".DLL";
+        if (!kyv::FileExists(file.native())) {
+            continue;
+        }
+        if (const kyv::LibraryHandle library = kyv::OpenLibrary(file.native())) {
+            g_textsBeside = reinterpret_cast<KyvLanguageTextFunction>(
+                kyv::FindSymbol(library, KYV_LANGUAGE_TEXT_NAME));
+        }
+    }
+}
+
+std::string SectionOf(const EffectDescriptor& effect, uint32_t param) {
+    if (effect.properties.family != EffectFamily_PictureInPicture) {
+        return {};
+    }
+    // Each begins with its switch.
+    static constexpr std::pair<std::string_view, const char*> kSections[] = {
+        {"P23", "Border"}, {"P15", "Shadow"}, {"P12", "Picture"}, {"P8", "Color key"}};
+    for (const auto& [key, name] : kSections) {
+        for (uint32_t i = 0; i <= param; ++i) {
+            if (key == effect.params[i].key) {
+                return name;
+            }
+        }
+    }
+    return {};
+}
 
 std::string WordsOfKey(std::string_view key) {
     key = WithoutLabels(key);
@@ -122,11 +164,13 @@ std::string WordsOfKey(std::string_view key) {
 
 std::string LanguageText(const EffectDescriptor& effect, const char* key) {
     const KyvModuleHandle library = effect.module ? effect.module->ResourceLibrary : nullptr;
-    if (!library || !key) {
+    if (!key) {
         return {};
     }
-    const auto find =
-        reinterpret_cast<KyvLanguageTextFunction>(kyv::FindSymbol(library, KYV_LANGUAGE_TEXT_NAME));
+    auto find = library ? reinterpret_cast<KyvLanguageTextFunction>(
+                              kyv::FindSymbol(library, KYV_LANGUAGE_TEXT_NAME))
+                        : nullptr;
+    find = find ? find : g_textsBeside.load();
     const char* const text = find ? find(key) : nullptr;
     return text ? text : "";
 }

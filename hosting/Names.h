@@ -7,6 +7,7 @@
 #pragma once
 
 #include <cstdint>
+#include <filesystem>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -15,8 +16,20 @@
 
 namespace kyvhosting {
 
-// The text of a key in the module's language library; empty when there is none.
+// The text of a key in the module's language library, or in that of UseTextsBeside; empty when
+// there is none.
 std::string LanguageText(const EffectDescriptor& effect, const char* key);
+
+// For plug-ins in folders with dots in their names: the module takes its file's name only as far as
+// the first dot of the path, and so finds no language library there. Looks beside the module, for
+// the user's language and then for English, and keeps the library open. Later calls do nothing once
+// one was found.
+void UseTextsBeside(const std::filesystem::path& module);
+
+// The part of an effect that a parameter belongs to, in English: "Border"; empty where the effect
+// has no parts. Several parameters of the picture-in-picture have the same name, and this tells
+// them apart.
+std::string SectionOf(const EffectDescriptor& effect, uint32_t param);
 
 // The words of a key, without its prefix, tags, ending and choice labels.
 std::string WordsOfKey(std::string_view key);

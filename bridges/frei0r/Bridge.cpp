@@ -2,7 +2,6 @@
 #include "bridges/frei0r/Bridge.h"
 
 #include <cstdio>
-#include <cstdlib>
 #include <exception>
 #include <filesystem>
 #include <new>
@@ -20,27 +19,15 @@
 namespace kyvfrei0r {
 namespace {
 
-namespace fs = std::filesystem;
-
 // No frame is larger; the products that follow stay far from overflow.
 constexpr unsigned kMaxSide = 1U << 16;
 constexpr uint64_t kMaxPixels = uint64_t{1} << 28;
 
-// Beside the plug-in or in the folder above, as KYV_DSP_MODULE names it, where the build tree has
-// it, or where it was installed.
-fs::path ModuleFile() {
-    if (const char* const named = std::getenv("KYV_DSP_MODULE")) {
-        return kyvhosting::PathOf(named);
-    }
-    const fs::path folder = fs::path(kyv::LibraryFileName(kyv::OwnLibrary())).parent_path();
-    fs::path file = kyvhosting::FindModuleFile({folder, folder / "..", folder / "../../../module",
-                                                folder / kyvhosting::PathOf(KYV_MODULE_FOLDER)});
-    if (file.empty()) {
-        throw kyvhosting::CModuleError(
-            "no " KYV_MODULE_NAME " beside the plug-in in " + kyvhosting::TextOf(folder) +
-            " or in the folder above; put it there, or name it in KYV_DSP_MODULE");
-    }
-    return file;
+// Beside the plug-in or in the folder above, where the build tree has it, or where it was
+// installed.
+std::filesystem::path ModuleFile() {
+    return kyvhosting::FindPluginsModule(
+        {".", "..", "../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)});
 }
 
 // Loaded once for each plug-in, at its first instance, and kept, as the plug-in itself is: hosts

@@ -51,11 +51,6 @@ constexpr PluginName kPlugins[] = {
     {"kyv_white_balance", "Kyv_Dsp_Co_WhiteBalance"},
 };
 
-// The sections of the picture-in-picture begin with their switches; several of its parameters have
-// the same name, and the section tells them apart.
-const std::map<std::string, std::string> kSections = {
-    {"P8", "Color key"}, {"P12", "Picture"}, {"P15", "Shadow"}, {"P23", "Border"}};
-
 // A corner pin fills the frame and has no frills until it is asked for them.
 const std::map<std::string, double> kCornerPinDefaults = {
     {"P0", 0}, {"P1", 0}, {"P2", 1}, {"P3", 0},  {"P4", 1}, {"P5", 1},
@@ -220,12 +215,7 @@ Plugin MakePlugin(const ModuleDescriptor& module, const PluginName& source) {
         plugin.explanation =
             "Pins the picture to four free corners, over a transparent or colored background";
     }
-    std::string section;
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
-        const auto found = kSections.find(effect.params[i].key);
-        if (effect.properties.family == 40 && found != kSections.end()) {
-            section = found->second;
-        }
         if (source.isCornerPin && i == 8) {
             Param color, opacity;
             color.name = "Background color";
@@ -237,7 +227,7 @@ Plugin MakePlugin(const ModuleDescriptor& module, const PluginName& source) {
             plugin.params.push_back(color);
             plugin.params.push_back(opacity);
         }
-        AddParam(plugin, i, section);
+        AddParam(plugin, i, kyvhosting::SectionOf(effect, i));
         if (effect.properties.isTransition &&
             kyvhosting::WordsOfKey(effect.params[i].nameKey) == "Percentage") {
             plugin.wipe = static_cast<int>(i);
