@@ -97,11 +97,12 @@ private:
 
     // A mistyped member would be lost without a word.
     void CheckMembers(const JsonNode& object, std::span<const char* const> known) {
-        for (const auto& [name, node] : object.members) {
+        for (size_t i = 0; i < object.names.size(); ++i) {
+            const std::string& name = object.names[i];
             if (std::find(known.begin(), known.end(), name) == known.end()) {
                 const std::vector<std::string> names(known.begin(), known.end());
                 const std::string nearest = Nearest(name, names);
-                Refuse(node, name,
+                Refuse(object.items[i], name,
                        "is not known here; " + (nearest.empty() ? "there are " + Join(names, ", ")
                                                                 : "the nearest is " + nearest));
             }
@@ -185,8 +186,9 @@ private:
             At(effect, [&] { return std::cref(FindEffect(m_module, effect.text, kAllEffects)); });
         CClipInstance trial(descriptor);
         if (node.Find("values")) {
-            for (const auto& [param, value] : Need(node, "values", Kind::Object).members) {
-                ReadValue(value, param, trial, stage);
+            const JsonNode& values = Need(node, "values", Kind::Object);
+            for (size_t i = 0; i < values.names.size(); ++i) {
+                ReadValue(values.items[i], values.names[i], trial, stage);
             }
         }
         stage.easing = ReadEasing(node);

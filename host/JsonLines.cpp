@@ -85,7 +85,7 @@ public:
         if (m_open.back()->Find(name)) {
             RefuseAt(m_file, m_place.lastLine, Quoted(name) + " is there twice");
         }
-        m_open.back()->members.emplace_back(name, JsonNode());
+        m_open.back()->names.push_back(name);
         m_nKeyLine = m_place.lastLine;
         return true;
     }
@@ -103,11 +103,9 @@ private:
     bool Add(Kind kind, const std::string& text) {
         JsonNode* node = &m_root;
         int line = m_place.lastLine;
-        if (!m_open.empty() && m_open.back()->kind == Kind::Object) {
-            node = &m_open.back()->members.back().second;
-            line = m_nKeyLine;
-        } else if (!m_open.empty()) {
+        if (!m_open.empty()) {
             node = &m_open.back()->items.emplace_back();
+            line = m_open.back()->kind == Kind::Object ? m_nKeyLine : line;
         }
         node->kind = kind;
         node->line = line;
@@ -141,9 +139,8 @@ private:
 } // namespace
 
 const JsonNode* JsonNode::Find(std::string_view name) const {
-    const auto member = std::find_if(members.begin(), members.end(),
-                                     [name](const auto& one) { return one.first == name; });
-    return member == members.end() ? nullptr : &member->second;
+    const auto found = std::find(names.begin(), names.end(), name);
+    return found == names.end() ? nullptr : &items[static_cast<size_t>(found - names.begin())];
 }
 
 JsonNode ParseJson(std::string_view text, const std::string& file) {

@@ -3,7 +3,6 @@
 
 #include <string>
 #include <string_view>
-#include <utility>
 #include <vector>
 
 namespace kyvhost {
@@ -12,10 +11,10 @@ struct JsonNode {
     enum class Kind { Null, Switch, Number, Text, List, Object };
 
     Kind kind = Kind::Null;
-    int line = 0;     // from 1; of a member, that of its name
-    std::string text; // of a text, or as a person would write it: on, off, 0.25
-    std::vector<JsonNode> items;
-    std::vector<std::pair<std::string, JsonNode>> members; // in the file's order
+    int line = 0;                   // from 1; of a member, that of its name
+    std::string text;               // of a text, or as a person would write it: on, off, 0.25
+    std::vector<JsonNode> items;    // of a list, or an object's values in the file's order
+    std::vector<std::string> names; // of an object, one for each value
 
     // Null when there is none.
     const JsonNode* Find(std::string_view name) const;

@@ -70,26 +70,26 @@ struct ColorLabels {
 struct VideoInfo {
     int streamIndex = 0;
     std::string codec;
-    bool isStill = false; // one picture in a format that only ffmpeg knows
-    uint32_t width = 0;   // pixels, after the rotation that the file asks for
+    uint32_t width = 0; // pixels, after the rotation that the file asks for
     uint32_t height = 0;
     Rational rate;               // frames a second; the average when the rate varies
-    bool isRegular = true;       // whether time stamps are meant to lie on the rate's grid
     Rational timeBase{1, 1000};  // seconds a tick of the time stamps
     int64_t frameCount = 0;      // as the file says or its duration gives; 0 when unknown
     double seconds = 0;          // of the stream; 0 when unknown
     double startSeconds = 0;     // of the stream, counted from the start of the file
     Rational sampleAspect{1, 1}; // shape of a pixel
-    bool isBt709 = false;        // else BT.601: the matrix between its YUV and RGB
     ColorLabels labels;
     std::string pixelFormat;
     int bits = 8; // of a component
-    bool hasAlpha = false;
     FieldOrder fields = FieldOrder::Progressive;
     std::string hdrMetadata; // what the file tells about its mastering, for a message; or empty
     std::vector<std::pair<std::string, std::string>> tags; // of the stream: language, title, ...
     std::vector<StreamInfo> others;                        // in the file's order
     size_t chapters = 0;
+    bool isStill = false;  // one picture in a format that only ffmpeg knows
+    bool isRegular = true; // whether time stamps are meant to lie on the rate's grid
+    bool isBt709 = false;  // else BT.601: the matrix between its YUV and RGB
+    bool hasAlpha = false;
     bool hasTitle = false; // of the whole file
 
     std::vector<std::string> AudioCodecs() const; // in order
