@@ -63,6 +63,7 @@ void RenderStill(RenderJob& job, const std::filesystem::path& file) {
         frames.push_back(std::move(picture.pixels));
         job.Form().Apply(frames.back(), picture.width);
     }
+    inputs.reserve(frames.size());
     for (const Frame& frame : frames) {
         inputs.push_back(frame.data());
     }

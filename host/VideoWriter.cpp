@@ -72,7 +72,10 @@ public:
         Add(m_plan.maps,
             {"-map_metadata", "1", "-map_chapters", m_container.chapters ? "1" : "-1"});
         for (const auto& [name, value] : m_info.tags) {
-            Add(m_plan.maps, {"-metadata:s:v:0", name + "=" + value});
+            std::string tag = name;
+            tag += "=";
+            tag += value;
+            Add(m_plan.maps, {"-metadata:s:v:0", tag});
         }
         return std::move(m_plan);
     }
