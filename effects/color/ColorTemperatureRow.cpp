@@ -66,6 +66,6 @@ void ColorTemperatureRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
 }
 
 constinit const KernelTable<ColorTemperatureRow> kColorTemperatureRow = {
-    KYV_TABLE(ColorTemperatureRow)};
+    KYV_TABLE(ColorTemperatureRow), .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

@@ -62,6 +62,7 @@ void WhiteBalanceRow_scalar(uint8_t* dst, const uint8_t* src, size_t count,
     }
 }
 
-constinit const KernelTable<WhiteBalanceRow> kWhiteBalanceRow = {KYV_TABLE(WhiteBalanceRow)};
+constinit const KernelTable<WhiteBalanceRow> kWhiteBalanceRow = {KYV_TABLE(WhiteBalanceRow),
+                                                                 .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

@@ -37,6 +37,7 @@ void RippleOffsetRow_scalar(float* offsets, size_t count, int32_t dy, const Ripp
     }
 }
 
-constinit const KernelTable<RippleOffsetRow> kRippleOffsetRow = {KYV_TABLE(RippleOffsetRow)};
+constinit const KernelTable<RippleOffsetRow> kRippleOffsetRow = {KYV_TABLE(RippleOffsetRow),
+                                                                 .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

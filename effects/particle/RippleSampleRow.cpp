@@ -42,6 +42,7 @@ void RippleSampleRow_scalar(uint8_t* dst, const RipplePicture& picture, int32_t 
     }
 }
 
-constinit const KernelTable<RippleSampleRow> kRippleSampleRow = {KYV_TABLE(RippleSampleRow)};
+constinit const KernelTable<RippleSampleRow> kRippleSampleRow = {KYV_TABLE(RippleSampleRow),
+                                                                 .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

@@ -43,6 +43,7 @@ void DreamyRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* veil, siz
 }
 
 constinit const KernelTable<DreamyVeilRow> kDreamyVeilRow = {KYV_TABLE(DreamyVeilRow)};
-constinit const KernelTable<DreamyRow> kDreamyRow = {KYV_TABLE(DreamyRow)};
+constinit const KernelTable<DreamyRow> kDreamyRow = {KYV_TABLE(DreamyRow),
+                                                     .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

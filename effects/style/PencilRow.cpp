@@ -73,7 +73,8 @@ void PencilPaperRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* ink,
 
 constinit const KernelTable<SmoothRow> kSmoothRow = {KYV_TABLE(SmoothRow)};
 constinit const KernelTable<PencilLineRow> kPencilLineRow = {KYV_TABLE(PencilLineRow)};
-constinit const KernelTable<PencilInkRow> kPencilInkRow = {KYV_TABLE(PencilInkRow)};
+constinit const KernelTable<PencilInkRow> kPencilInkRow = {KYV_TABLE(PencilInkRow),
+                                                           .passedOver = kNoneIsPassedOver};
 constinit const KernelTable<PencilPaperRow> kPencilPaperRow = {KYV_TABLE(PencilPaperRow)};
 
 } // namespace kyv

@@ -56,6 +56,7 @@ void RayAddRow_scalar(uint8_t* dst, const uint8_t* src, const uint8_t* light, si
 constinit const KernelTable<RayShadeRow> kRayShadeRow = {KYV_TABLE(RayShadeRow)};
 constinit const KernelTable<RayLerpRow> kRayLerpRow = {KYV_TABLE(RayLerpRow)};
 constinit const KernelTable<RayStepRow> kRayStepRow = {KYV_TABLE(RayStepRow)};
-constinit const KernelTable<RayAddRow> kRayAddRow = {KYV_TABLE(RayAddRow)};
+constinit const KernelTable<RayAddRow> kRayAddRow = {KYV_TABLE(RayAddRow),
+                                                     .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

@@ -58,7 +58,7 @@ struct KernelTable {
     Function avx512 = nullptr;
     Function neon = nullptr;
     // Sets whose form exists, is tested and timed, but serves no effect better than the next lower
-    // one: SetBit of each. Twice the width of AVX2 gains nothing on pixels that come from memory,
+    // one: SetBit of each. Twice the width of AVX2 gains little on pixels that come from memory,
     // so a table for which it does gain, in a whole effect, says so with kNoneIsPassedOver.
     uint32_t passedOver = SetBit(InstructionSet::Avx512);
 

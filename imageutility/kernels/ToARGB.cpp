@@ -16,6 +16,7 @@ void ToARGB_scalar(uint8_t* dst, const uint8_t* src, size_t count) {
     }
 }
 
-constinit const KernelTable<ToARGBRow> kToARGB = {KYV_TABLE(ToARGB)};
+constinit const KernelTable<ToARGBRow> kToARGB = {KYV_TABLE(ToARGB),
+                                                  .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

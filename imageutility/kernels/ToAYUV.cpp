@@ -16,6 +16,7 @@ void ToAYUV_scalar(uint8_t* dst, const uint8_t* src, size_t count) {
     }
 }
 
-constinit const KernelTable<ToAYUVRow> kToAYUV = {KYV_TABLE(ToAYUV)};
+constinit const KernelTable<ToAYUVRow> kToAYUV = {KYV_TABLE(ToAYUV),
+                                                  .passedOver = kNoneIsPassedOver};
 
 } // namespace kyv

@@ -88,10 +88,28 @@ public:
     void FillPixels(Fill fill, uint32_t seed) {
         size_t offset = seed * 7919;
         for (int32_t y = 0; y < m_height; ++y) {
-            for (size_t x = 0; x < m_rowBytes; ++x) {
-                const uint8_t values[] = {RandomPool()[offset++ % RandomPool().size()], 0, 255,
-                                          static_cast<uint8_t>((x ^ y) & 1 ? 255 : 0)};
-                Pixels()[y * m_pitch + x] = values[static_cast<int>(fill)];
+            uint8_t* row = Pixels() + y * m_pitch;
+            switch (fill) {
+            case Fill::Random:
+                for (size_t x = 0; x < m_rowBytes;) {
+                    const size_t from = offset % RandomPool().size();
+                    const size_t count = std::min(m_rowBytes - x, RandomPool().size() - from);
+                    std::memcpy(row + x, &RandomPool()[from], count);
+                    x += count;
+                    offset += count;
+                }
+                break;
+            case Fill::Zeros:
+                std::memset(row, 0, m_rowBytes);
+                break;
+            case Fill::Ones:
+                std::memset(row, 255, m_rowBytes);
+                break;
+            case Fill::Alternating:
+                for (size_t x = 0; x < m_rowBytes; ++x) {
+                    row[x] = (x ^ y) & 1 ? 255 : 0;
+                }
+                break;
             }
         }
     }
@@ -388,7 +406,9 @@ constexpr size_t kFormCount = 5;
 #endif
 
 // Tables for which AVX-512 wins in a whole effect; all others stay with AVX2.
-const std::set<std::string> kWideTables = {};
+const std::set<std::string> kWideTables = {
+    "kColorTemperatureRow", "kDreamyRow", "kPencilInkRow", "kRayAddRow",      "kRippleOffsetRow",
+    "kRippleSampleRow",     "kToARGB",    "kToAYUV",       "kWhiteBalanceRow"};
 
 TEST(Levels, SelectTheFormOfTheirSetInEveryTable) {
     for (const KernelEntry& entry : KernelCatalog()) {
