@@ -87,7 +87,7 @@ void AddDisplay(CLI::App* verb, EffectSettings& settings) {
 
 void AddLevel(CLI::App* verb, EffectSettings& settings) {
     AddText(verb, "--level", "0..5",
-            "instruction sets: below 3 none, 3 SSE2, 4 and 5 the best there is; default: 5",
+            "instruction sets: below 3 none, 3 SSE2 or NEON, 4 and 5 the best; default: 5",
             [&settings](const std::string& text) { settings.level = ParseLevel(text); });
     verb->add_flag_callback(
         "--narrow-map", [&settings] { settings.wideMap = false; },
