@@ -1,5 +1,7 @@
 // The calling protocol, for all effects alike.
 #include <array>
+#include <set>
+#include <string>
 
 #include <gtest/gtest.h>
 
@@ -129,13 +131,13 @@ TEST_P(Lifecycle, SetInputFrameFillsTheLeadingPointers) {
 TEST_P(Lifecycle, RequestFlagsAreSetByTheEffectsThatNeedThem) {
     CTestInstance instance(effect(), 4, 4);
     ASSERT_EQ(instance.Begin(), 0U);
-    const std::string id = effect().identifier;
-    const bool color = id.starts_with("Kyv_Dsp_Co_");
-    const bool transition = id.starts_with("DSP_TR_");
-    const bool sprites = id.ends_with("Bubble") || id.ends_with("Fireworks");
-    EXPECT_EQ(instance.Context().requestA, color || transition ? 1U : 0U);
-    EXPECT_EQ(instance.Context().requestB,
-              color || sprites || id == "Kyv_Dsp_Vi_LightRay" ? 1U : 0U);
+    const std::set<std::string> settingA = {"Kyv_Dsp_Co_Temperature", "Kyv_Dsp_Co_WhiteBalance",
+                                            "DSP_TR_TestAlpha", "DSP_TR_AlphaTransition"};
+    const std::set<std::string> settingB = {
+        "Kyv_Dsp_Co_Temperature", "Kyv_Dsp_Co_WhiteBalance", "Kyv_Dsp_Pfx_RefractiveBubble",
+        "Kyv_Dsp_Pfx_Bubble",     "Kyv_Dsp_Pfx_Fireworks",   "Kyv_Dsp_Vi_LightRay"};
+    EXPECT_EQ(instance.Context().requestA, settingA.count(effect().identifier));
+    EXPECT_EQ(instance.Context().requestB, settingB.count(effect().identifier));
 }
 
 TEST_P(Lifecycle, AbsurdFrameSizesAreRefused) {
