@@ -130,7 +130,7 @@ const std::vector<Plan>* MakePlans() noexcept {
         auto plans = std::make_unique<std::vector<Plan>>();
         // Kept, as the plug-in itself is: hosts unload at moments when the module may not be.
         kyv::KeepOwnLibrary();
-        const auto* const module = new kyvhosting::CModule(kyvhosting::FindPluginsModule(
+        static const auto* const module = new kyvhosting::CModule(kyvhosting::FindPluginsModule(
             {".", "..", "../../../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)}));
         kyvhosting::UseTextsBeside(module->File());
         const ModuleDescriptor& descriptor = module->Descriptor();
