@@ -314,6 +314,36 @@ std::string Slider(const std::string& index, const char* type, double initial, d
            (suffix.empty() ? "" : " suffix=\"" + suffix + "\"") + ">\n";
 }
 
+std::string KdenliveColor(const Param& param, const std::string& index) {
+    char color[16] = "0x000000ff";
+    if (param.record) {
+        const auto part = [&](size_t k) {
+            return unsigned(kyvhosting::ComponentOf(*param.record, param.record->defaultValue, k));
+        };
+        std::snprintf(color, sizeof color, "0x%02x%02x%02xff", part(0), part(1), part(2));
+    }
+    return "    <parameter type=\"color\" name=\"" + index + "\" default=\"" + color + "\">\n";
+}
+
+// A list where the values have names, else a slider: over the whole numbers that count something,
+// over percents of the range otherwise.
+std::string KdenliveRange(const Param& param, const std::string& index) {
+    if (param.choices.empty()) {
+        const kyvhosting::NumberRange range = kyvhosting::RangeOf(*param.record);
+        const bool isCount = kyvhosting::IsWhole(*param.record) && range.least == 0;
+        const double most = isCount ? range.most : 100;
+        return Slider(index, "animated", Initial(param), 0, most, most, isCount ? "" : "%");
+    }
+    std::string values, names;
+    for (size_t k = 0; k < param.choices.size(); ++k) {
+        values += (k ? ";" : "") + Number(double(k) / double(param.choices.size() - 1));
+        names += (k ? "," : "") + Escaped(param.choices[k]);
+    }
+    return "    <parameter type=\"list\" name=\"" + index + "\" default=\"" +
+           Number(Initial(param)) + "\" paramlist=\"" + values + "\">\n        <paramlistdisplay>" +
+           names + "</paramlistdisplay>\n";
+}
+
 std::string KdenliveParam(const Plugin& plugin, size_t i) {
     const Param& param = plugin.params[i];
     const std::string index = std::to_string(i);
@@ -330,18 +360,9 @@ std::string KdenliveParam(const Plugin& plugin, size_t i) {
                Number(Initial(param)) + "\">\n";
         break;
     case Mapping::Color:
-    case Mapping::BackgroundColor: {
-        char color[16] = "0x000000ff";
-        if (param.record) {
-            const auto part = [&](size_t k) {
-                return unsigned(
-                    kyvhosting::ComponentOf(*param.record, param.record->defaultValue, k));
-            };
-            std::snprintf(color, sizeof color, "0x%02x%02x%02xff", part(0), part(1), part(2));
-        }
-        text = "    <parameter type=\"color\" name=\"" + index + "\" default=\"" + color + "\">\n";
+    case Mapping::BackgroundColor:
+        text = KdenliveColor(param, index);
         break;
-    }
     case Mapping::Plain:
         text = Slider(index, "animated", Initial(param), -100, 200, 100, "%");
         break;
@@ -351,24 +372,9 @@ std::string KdenliveParam(const Plugin& plugin, size_t i) {
     case Mapping::BackgroundOpacity:
         text = Slider(index, "animated", 0, 0, 100, 100, "%");
         break;
-    case Mapping::Unit: {
-        if (!param.choices.empty()) {
-            std::string values, names;
-            for (size_t k = 0; k < param.choices.size(); ++k) {
-                values += (k ? ";" : "") + Number(double(k) / double(param.choices.size() - 1));
-                names += (k ? "," : "") + Escaped(param.choices[k]);
-            }
-            text = "    <parameter type=\"list\" name=\"" + index + "\" default=\"" +
-                   Number(Initial(param)) + "\" paramlist=\"" + values +
-                   "\">\n        <paramlistdisplay>" + names + "</paramlistdisplay>\n";
-            break;
-        }
-        const kyvhosting::NumberRange range = kyvhosting::RangeOf(*param.record);
-        const bool isCount = kyvhosting::IsWhole(*param.record) && range.least == 0;
-        text = Slider(index, "animated", Initial(param), 0, isCount ? range.most : 100,
-                      isCount ? range.most : 100, isCount ? "" : "%");
+    case Mapping::Unit:
+        text = KdenliveRange(param, index);
         break;
-    }
     }
     text += "        <name>" + Escaped(param.name) + "</name>\n";
     if (!param.explanation.empty()) {
