@@ -265,6 +265,10 @@ void CFreeformPiP::RenderRun(uint8_t* dst, const Run& run, int32_t y,
                              const SamplePicture& picture) const {
     const auto count = static_cast<size_t>(run.end - run.first);
     const size_t first = PixelIndex(run.first, y);
+    if (m_nMapMode == MapMode_Filtered) { // which has no map
+        RenderFiltered(dst, m_records.data() + first * 2, count, picture);
+        return;
+    }
     const uint32_t* map = m_pSourceMap.get() + first * EntriesPerPixel();
     if (!picture.pixels) {
         RenderChecker(dst, map, count);
@@ -282,9 +286,6 @@ void CFreeformPiP::RenderRun(uint8_t* dst, const Run& run, int32_t y,
         break;
     case MapMode_GridBilinear:
         RenderGridBilinear(dst, map, count, picture);
-        break;
-    case MapMode_Filtered:
-        RenderFiltered(dst, m_records.data() + first * 2, count, picture);
         break;
     default:
         break;
