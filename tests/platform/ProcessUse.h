@@ -1,7 +1,9 @@
 // What this process holds of the system, for tests that look for leaks.
 #pragma once
 
+#include <chrono>
 #include <cstdint>
+#include <thread>
 
 namespace kyvtest {
 
@@ -13,6 +15,15 @@ struct ProcessUse {
 };
 
 ProcessUse GetProcessUse();
+
+// Whether there are no more threads than that. The system may list one for a moment after it was
+// waited for, which is allowed for.
+inline bool ThreadsComeDownTo(int64_t count) {
+    for (int i = 0; i < 1000 && GetProcessUse().threads > count; ++i) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    return GetProcessUse().threads <= count;
+}
 
 // How often this thread has been given a page of memory. 0 where the system does not tell.
 int64_t GetPageFaults();
