@@ -264,22 +264,17 @@ Status CEffect::Complain(KyvStatus status) {
 bool CEffect::Fetch(size_t clip, double time, const RectI& area, Frame& frame) const {
     const CHeldImage held(IsConnected(m_clips[clip]) ? m_clips[clip] : nullptr, time);
     const std::optional<Image> image = held ? ImageOf(held.Props()) : std::nullopt;
-    if (!image) {
+    // The second picture fills the frame whatever its size and place.
+    const bool isPicture = m_plan.IsPictureInPicture() && clip == 1;
+    const RectI own = image && isPicture ? kyvofx::RegionOf(held.Props(), image->bounds) : area;
+    if (!image || !IsPossible(own)) {
         frame.assign(static_cast<size_t>(Width(area) * Height(area)), 0);
         return false;
     }
-    // The second picture fills the frame whatever its size.
-    const RectI own = kyvofx::RegionOf(held.Props(), image->bounds);
-    const bool isOther = m_plan.IsPictureInPicture() && clip == 1 && IsPossible(own) &&
-                         (Width(own) != Width(area) || Height(own) != Height(area));
-    if (isOther) {
-        Frame picture;
-        ReadImage(*image, own, picture);
-        frame = Scaled(picture, static_cast<size_t>(Width(own)), static_cast<size_t>(Height(own)),
+    ReadImage(*image, own, frame);
+    if (Width(own) != Width(area) || Height(own) != Height(area)) {
+        frame = Scaled(frame, static_cast<size_t>(Width(own)), static_cast<size_t>(Height(own)),
                        static_cast<size_t>(Width(area)), static_cast<size_t>(Height(area)));
-    } else {
-        const bool isMoved = m_plan.IsPictureInPicture() && clip == 1;
-        ReadImage(*image, isMoved ? own : area, frame);
     }
     return true;
 }

@@ -493,6 +493,30 @@ TEST(OpenFxTest, RegionsAreWholePictures) {
               ByModule(own, a, Frame(a.size(), 0xFF4080C0)));
 }
 
+// A picture that is no possible frame counts as none: its pixels are fewer than the frame's here,
+// and are told to be many more.
+TEST(OpenFxTest, ImpossiblePicturesAreLeftOut) {
+    const Frame a = RandomFrame(300 * 300, 31);
+    constexpr RectI kFrame = {0, 0, 300, 300};
+    const std::pair<Frame, RectI> pictures[] = {
+        {Frame(70000, 0xFF4080C0), {0, 0, 70000, 1}},
+        {Frame(8 * 8, 0xFF4080C0), {0, 0, 8, 8}},
+    };
+    for (const auto& [picture, bounds] : pictures) {
+        COfxInstance pip("freeform-picture-in-picture");
+        pip.Connect(clip::kSource, a, kFrame);
+        pip.Connect("Picture", picture, bounds);
+        if (bounds.x2 == 8) {
+            pip.Effect().clips["Picture"].image->props.Set(prop::kImageRegion,
+                                                           {0, 0, 1 << 30, 1 << 30});
+        }
+        pip.Connect(clip::kOutput, Frame(a.size(), 0x11223344), kFrame);
+        OfxProps in = pip.RenderArguments(kTime, kFrame);
+        EXPECT_EQ(pip.Act(action::kRender, &in), kStatOk);
+        EXPECT_EQ(pip.Effect().clips[clip::kOutput].image->Pixels(), a);
+    }
+}
+
 // Images that no effect can work on are refused; nothing is touched.
 TEST(OpenFxTest, BrokenImagesAreRefused) {
     const Frame a = Input(21), b = Input(22);
