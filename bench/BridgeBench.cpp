@@ -10,6 +10,7 @@
 #include "bridges/frei0r/Frei0r.h"
 #include "hosting/Error.h"
 #include "hosting/Instance.h"
+#include "hosting/Plugin.h"
 #include "tests/bridges/Frei0rHost.h"
 #include "tests/support/TestHost.h"
 
@@ -88,7 +89,7 @@ void Prepare(kyvhosting::CInstance& instance, uint32_t width, uint32_t height) {
     EffectContext& context = instance.Context();
     context.width = width;
     context.height = height;
-    context.cpuLevel = int32_t{CpuLevel_Avx2} | int32_t{CpuLevelOption_WideMap};
+    context.cpuLevel = kyvhosting::kPluginCpuLevel;
     kyvhosting::Require(instance.Init(), effect, "InitInstance");
     if (effect.params[0].type == ParamType_Color) {
         instance.Set("P1", uint32_t{0x80C0FF});

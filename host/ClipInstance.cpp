@@ -82,7 +82,7 @@ void CClipInstance::ApplyKeyframes(double frame) {
 void CClipInstance::Begin(const FrameShape& shape) {
     m_shape = shape;
     EffectContext& context = Context();
-    context.width = shape.sideBySide ? shape.frameWidth / 2 : shape.frameWidth;
+    context.width = shape.ViewWidth();
     context.height = shape.height;
     context.stereoLayout = shape.sideBySide ? StereoLayout_LeftHalf : StereoLayout_Mono;
     Require(m_instance.Begin(), Effect(), "BeginProcessing");

@@ -18,6 +18,7 @@ struct FrameShape {
     uint32_t height = 0;
     bool sideBySide = false;
 
+    uint32_t ViewWidth() const { return sideBySide ? frameWidth / 2 : frameWidth; }
     size_t Pixels() const { return size_t{frameWidth} * height; }
     size_t Bytes() const { return Pixels() * 4; }
 };

@@ -169,9 +169,9 @@ Timeline CClip::Joined() const {
     const int64_t overlap = std::llround(*m_options.overlap * m_rate.Value());
     const int64_t most = std::min(frames[0], frames[1]);
     if (overlap < 1 || overlap > most) {
-        throw CUsageError(
-            "--overlap: " + SecondsText(*m_options.overlap) + " is out of range: one frame to " +
-            SecondsText(static_cast<double>(most) / m_rate.Value()) + ", the shorter video");
+        throw CUsageError("--overlap: " + SecondsText(*m_options.overlap) +
+                          " is out of range: one frame to " + SecondsText(Seconds(most)) +
+                          ", the shorter video");
     }
     return {frames[0] - overlap, overlap, frames[0] + frames[1] - overlap, true};
 }
@@ -180,12 +180,9 @@ SoundJoin CClip::JoinedSound() const {
     const auto fileOf = [](const Source& source) {
         return source.video.AudioCodecs().empty() ? fs::path() : source.file;
     };
-    const auto seconds = [this](int64_t frames) {
-        return static_cast<double>(frames) / m_rate.Value();
-    };
     return {fileOf(m_job.sources[0]), fileOf(m_job.sources[1]),
-            seconds(m_timeline.from + m_timeline.count),
-            seconds(m_timeline.total - m_timeline.from), seconds(m_timeline.count)};
+            Seconds(m_timeline.from + m_timeline.count),
+            Seconds(m_timeline.total - m_timeline.from), Seconds(m_timeline.count)};
 }
 
 VideoFormat CClip::Format() const {

@@ -51,7 +51,7 @@ std::string MeanColor(const Picture& picture, const Pick& pick) {
     return text;
 }
 
-// The options with the picked colour as the value of the first effect's one colour.
+// The effect's one colour.
 const ParamDescriptor& ColorParam(const EffectDescriptor& effect) {
     const ParamDescriptor* found = nullptr;
     for (uint32_t i = 0; i < effect.paramCount; ++i) {
@@ -181,7 +181,7 @@ void RenderJob::SetShape() {
 // The inner picture has the size of the frame, and without the wide map not all of it is reached.
 void RenderJob::SayWhatIsCut() {
     constexpr uint32_t kReached = 1024;
-    const uint32_t view = shape.sideBySide ? shape.frameWidth / 2 : shape.frameWidth;
+    const uint32_t view = shape.ViewWidth();
     if (!options.settings.wideMap && stack.HasInnerPicture() &&
         (view > kReached || shape.height > kReached)) {
         notes.Say("of the inner picture only the first " + std::to_string(kReached) +
@@ -194,7 +194,7 @@ void RenderJob::SetAspect(CStack& to) const {
     const Source& first = sources.front();
     const Rational& pixel = first.video.sampleAspect;
     if (!first.isPicture && pixel.num != pixel.den) {
-        const uint32_t view = shape.sideBySide ? shape.frameWidth / 2 : shape.frameWidth;
+        const uint32_t view = shape.ViewWidth();
         to.SetDefaultAspect(static_cast<uint32_t>(std::llround(view * pixel.Value())),
                             shape.height);
     }

@@ -1,7 +1,6 @@
 // Loading the module.
 #include "hosting/Module.h"
 
-#include <cstdlib>
 #include <memory>
 
 #include "hosting/Error.h"
@@ -38,24 +37,6 @@ fs::path FindModuleFile(const std::vector<fs::path>& folders) {
         }
     }
     return {};
-}
-
-fs::path FindPluginsModule(const std::vector<fs::path>& folders) {
-    if (const char* const named = std::getenv("KYV_DSP_MODULE")) {
-        return PathOf(named);
-    }
-    const fs::path own = fs::path(kyv::LibraryFileName(kyv::OwnLibrary())).parent_path();
-    std::vector<fs::path> places;
-    places.reserve(folders.size());
-    for (const fs::path& folder : folders) {
-        places.push_back(own / folder);
-    }
-    fs::path file = FindModuleFile(places);
-    if (file.empty()) {
-        Fail("no " KYV_MODULE_NAME " beside the plug-in in " + TextOf(own) +
-             " or in the folder above; put it there, or name it in KYV_DSP_MODULE");
-    }
-    return file;
 }
 
 CModule::CModule(const fs::path& file) : m_file(fs::absolute(file).lexically_normal()) {

@@ -11,11 +11,6 @@ namespace kyvhosting {
 // The module's file in the first of the folders that has it; empty when none does.
 std::filesystem::path FindModuleFile(const std::vector<std::filesystem::path>& folders);
 
-// For plug-ins that other programs load: the file that KYV_DSP_MODULE names, or the module in the
-// first of the folders that has it. Relative folders count from that of the plug-in, which is the
-// library that this code is linked into. Throws CModuleError when there is none.
-std::filesystem::path FindPluginsModule(const std::vector<std::filesystem::path>& folders);
-
 // A loaded and initialised module. Throws CModuleError when the file is missing or no library,
 // lacks an export, refuses to start, speaks another format number or has records without names or
 // callbacks.

@@ -11,34 +11,18 @@
 #include "bridges/frei0r/CornerPin.h"
 #include "bridges/frei0r/EffectPlugin.h"
 #include "hosting/Error.h"
-#include "hosting/Module.h"
 #include "hosting/Names.h"
+#include "hosting/Plugin.h"
 #include "hosting/Text.h"
-#include "platform/Library.h"
 
 namespace kyvfrei0r {
 namespace {
 
-// No frame is larger; the products that follow stay far from overflow.
-constexpr unsigned kMaxSide = 1U << 16;
-constexpr uint64_t kMaxPixels = uint64_t{1} << 28;
-
 // Beside the plug-in or in the folder above, where the build tree has it, or where it was
 // installed.
-std::filesystem::path ModuleFile() {
-    return kyvhosting::FindPluginsModule(
-        {".", "..", "../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)});
-}
-
-// Loaded once for each plug-in, at its first instance, and kept, as the plug-in itself is: hosts
-// load and unload plug-ins at moments when the module may not be unloaded (from a library's own
-// unloading, say), and all plug-ins of a process share the one that the system has loaded.
 const kyvhosting::CModule& Module() {
-    static const kyvhosting::CModule* const module = [] {
-        kyv::KeepOwnLibrary();
-        return new kyvhosting::CModule(ModuleFile());
-    }();
-    return *module;
+    return kyvhosting::PluginsModule(
+        {".", "..", "../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)});
 }
 
 uint32_t ParamSizes(const EffectDescriptor& effect) {
@@ -64,8 +48,7 @@ const EffectDescriptor& EffectFor(const PluginTable& table) {
 
 std::unique_ptr<CPluginInstance> Construct(const PluginTable& table, unsigned width,
                                            unsigned height) noexcept {
-    if (width == 0 || height == 0 || width > kMaxSide || height > kMaxSide ||
-        uint64_t{width} * height > kMaxPixels) {
+    if (!kyvhosting::IsPossibleFrame(width, height)) {
         std::fprintf(stderr, "%s: cannot render frames of %u x %u pixels\n", table.file, width,
                      height);
         return nullptr;

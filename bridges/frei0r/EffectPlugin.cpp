@@ -8,6 +8,7 @@
 #include <cstring>
 #include <new>
 
+#include "hosting/Plugin.h"
 #include "hosting/Text.h"
 #include "hosting/Values.h"
 #include "platform/Library.h"
@@ -15,8 +16,8 @@
 namespace kyvfrei0r {
 namespace {
 
-constexpr double kUnitsPerSecond = 1e7; // the module counts in 100 ns
-constexpr double kLongestSeconds = 1e7;
+using kyvhosting::kUnitsPerSecond;
+
 constexpr double kLongestClip = 3600; // seconds; GStreamer lets no number pass 1
 
 // What is not finite becomes the plug-in's own default if it has one, and stays for the effect's.
@@ -48,30 +49,6 @@ double UnitsPerTimeOf(const void* caller) {
     return isFilterLibrary ? kUnitsPerSecond / 1000 : kUnitsPerSecond;
 }
 
-// Gives the pixels of to the alpha of those of from. What the effect leaves there is solid or the
-// same already, so where the source is solid, as most videos are, nothing needs to be written.
-void KeepAlpha(const void* from, void* to, size_t pixels) {
-    constexpr size_t kBlock = 1024;
-    const auto* source = static_cast<const uint8_t*>(from);
-    auto* target = static_cast<uint8_t*>(to);
-    for (size_t first = 0; first < pixels; first += kBlock) {
-        const size_t end = std::min(first + kBlock, pixels);
-        uint32_t all = 0xFF000000;
-        for (size_t i = first; i < end; ++i) {
-            uint32_t pixel;
-            std::memcpy(&pixel, source + 4 * i, sizeof pixel);
-            all &= pixel;
-        }
-        for (size_t i = first; all != 0xFF000000 && i < end; ++i) {
-            uint32_t color, alpha;
-            std::memcpy(&color, target + 4 * i, sizeof color);
-            std::memcpy(&alpha, source + 4 * i, sizeof alpha);
-            color = (color & 0x00FFFFFF) | (alpha & 0xFF000000);
-            std::memcpy(target + 4 * i, &color, sizeof color);
-        }
-    }
-}
-
 } // namespace
 
 CEffectPlugin::CEffectPlugin(const PluginTable& table, const EffectDescriptor& effect,
@@ -80,8 +57,7 @@ CEffectPlugin::CEffectPlugin(const PluginTable& table, const EffectDescriptor& e
     EffectContext& context = m_instance.Context();
     context.width = width;
     context.height = height;
-    // A ceiling: the processor decides below it. Pictures of any size are shown whole.
-    context.cpuLevel = int32_t{CpuLevel_Avx2} | int32_t{CpuLevelOption_WideMap};
+    context.cpuLevel = kyvhosting::kPluginCpuLevel;
     kyvhosting::Require(m_instance.Init(), effect, "InitInstance");
     for (int i = 0; i < table.paramCount; ++i) {
         if (table.params[i].ownDefault) {
@@ -185,19 +161,13 @@ void CEffectPlugin::GetParam(int index, void* value) noexcept {
 void CEffectPlugin::SetOwn(const ParamTable&, const void*) {}
 void CEffectPlugin::GetOwn(const ParamTable&, void*) const {}
 
-bool CEffectPlugin::SetTime(double time, const void* caller) {
+void CEffectPlugin::SetTime(double time, const void* caller) {
     if (caller != m_pCaller) {
         m_unitsPerTime = UnitsPerTimeOf(caller);
         m_pCaller = caller;
     }
-    const double units = time * m_unitsPerTime;
-    const bool isTime = units >= 0 && units <= kLongestSeconds * kUnitsPerSecond;
-    // A multiple of a frame's time comes out of floating point slightly below or above itself: the
-    // hundredth of a unit keeps 1.001 s from becoming 1.0009999 s, a millisecond earlier.
-    const double whole = isTime ? std::floor(units + 0.01) : 0;
-    m_instance.Context().position = static_cast<int64_t>(whole);
+    m_instance.Context().position = kyvhosting::TimeUnits(time * m_unitsPerTime);
     m_instance.Context().duration = std::llround(m_clipLength * kUnitsPerSecond);
-    return isTime;
 }
 
 void CEffectPlugin::Update(double time, const void* input0, const void* input1, void* output,
@@ -250,8 +220,8 @@ KyvStatus CEffectPlugin::RenderChecked(const void* input0, const void* input1, v
         m_bBegun = true;
     }
     const KyvStatus status = Render(input0, input1, output);
-    if (status == KYV_OK && m_table.keepsAlpha) {
-        KeepAlpha(input0, output, Pixels());
+    if (status == KYV_OK && kyvhosting::LosesAlpha(m_instance.Effect())) {
+        kyvhosting::KeepAlpha(input0, output, Pixels());
     }
     return status;
 }

@@ -38,7 +38,7 @@ protected:
 
 private:
     bool SetValue(const ParamTable& param, const void* value);
-    bool SetTime(double time, const void* caller);
+    void SetTime(double time, const void* caller);
     KyvStatus RenderChecked(const void* input0, const void* input1, void* output);
     void Complain(const char* what, KyvStatus status);
 

@@ -31,13 +31,12 @@ struct PluginName {
     const char* file;
     const char* effect;
     bool isCornerPin = false;
-    bool keepsAlpha = false;
 };
 
 // The effects that are not here yet are an error: nobody would look for them.
 constexpr PluginName kPlugins[] = {
     {"kyv_refractive_bubble", "Kyv_Dsp_Pfx_RefractiveBubble"},
-    {"kyv_water_ripple", "Kyv_Dsp_Pfx_WaterRipple", false, true},
+    {"kyv_water_ripple", "Kyv_Dsp_Pfx_WaterRipple"},
     {"kyv_bubble", "Kyv_Dsp_Pfx_Bubble"},
     {"kyv_fireworks", "Kyv_Dsp_Pfx_Fireworks"},
     {"kyv_picture_in_picture", "Kyv_Dsp_Pi_Freeform"},
@@ -278,8 +277,7 @@ std::string TableText(const Plugin& plugin) {
     text += "};\n\ninline constexpr PluginTable kTable = {\n    " + Literal(plugin.file) + ", " +
             Literal(effect.identifier) + ",\n    " + Literal(plugin.name) + ",\n    " +
             Literal(plugin.explanation) + ",\n    " + (plugin.IsMixer() ? "true" : "false") + ", " +
-            (plugin.source->isCornerPin ? "true" : "false") + ", " +
-            (plugin.source->keepsAlpha ? "true" : "false") + ", " + std::to_string(plugin.wipe) +
+            (plugin.source->isCornerPin ? "true" : "false") + ", " + std::to_string(plugin.wipe) +
             ", " + std::to_string(sizes) + ", kParams, " + std::to_string(plugin.params.size()) +
             "};\n\n} // namespace kyvfrei0r\n";
     return text;

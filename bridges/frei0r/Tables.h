@@ -36,7 +36,6 @@ struct PluginTable {
     const char* explanation;
     bool isMixer;
     bool isCornerPin; // the effect's first input is a background of the plug-in's own
-    bool keepsAlpha;  // the effect leaves something else in the alpha byte
     int wipe;         // index of the effect's parameter that is 0 at the first input and 1 at the
                       // second; -1: none
     uint32_t paramSizes; // of the effect's parameters: their number in the upper, the sum of their

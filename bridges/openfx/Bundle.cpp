@@ -1,4 +1,5 @@
 // The bundle's exports: a plug-in for each of the module's effects.
+#include <algorithm>
 #include <array>
 #include <memory>
 #include <new>

@@ -11,21 +11,18 @@
 #include "bridges/openfx/Describe.h"
 #include "hosting/Error.h"
 #include "hosting/Hex.h"
+#include "hosting/Plugin.h"
 #include "hosting/Values.h"
 
 namespace kyvofx {
 namespace {
 
-constexpr double kUnitsPerSecond = 1e7; // the module counts in 100 ns
-constexpr double kLongestSeconds = 1e7;
-
-// No frame is larger; the products that follow stay far from overflow.
-constexpr int64_t kMaxSide = 1 << 16;
-constexpr int64_t kMaxPixels = int64_t{1} << 28;
-
 bool IsPossible(const RectI& area) {
-    return !IsEmpty(area) && Width(area) <= kMaxSide && Height(area) <= kMaxSide &&
-           Width(area) * Height(area) <= kMaxPixels;
+    return kyvhosting::IsPossibleFrame(Width(area), Height(area));
+}
+
+double PositiveOr(double number, double fallback) {
+    return number > 0 && std::isfinite(number) ? number : fallback;
 }
 
 // Pixel coordinates are canonical ones times the scale, in x divided by the pixels' aspect.
@@ -33,11 +30,8 @@ struct Grid {
     double scaleX = 1, scaleY = 1;
 
     Grid(const CProps& in, double pixelAspect) {
-        const double x = in.Double(prop::kRenderScale, 1, 0),
-                     y = in.Double(prop::kRenderScale, 1, 1);
-        scaleX = x > 0 && std::isfinite(x) ? x : 1;
-        scaleY = y > 0 && std::isfinite(y) ? y : 1;
-        scaleX /= pixelAspect;
+        scaleX = PositiveOr(in.Double(prop::kRenderScale, 1, 0), 1) / pixelAspect;
+        scaleY = PositiveOr(in.Double(prop::kRenderScale, 1, 1), 1);
     }
 
     RectD ToCanonical(const RectI& area) const {
@@ -46,8 +40,7 @@ struct Grid {
 };
 
 double AspectOf(const CProps& props) {
-    const double aspect = props.Double(prop::kPixelAspect, 1);
-    return aspect > 0 && std::isfinite(aspect) ? aspect : 1;
+    return PositiveOr(props.Double(prop::kPixelAspect, 1), 1);
 }
 
 CProps PropsOfClip(ClipHandle clip) {
@@ -87,19 +80,11 @@ RectI RegionOf(const CProps& props, const RectI& bounds) {
     return props.Ints(prop::kImageRegion, 4, &region.x1) && !IsEmpty(region) ? region : bounds;
 }
 
-// The effect that draws water leaves solid pixels; hosts want the picture's own alpha.
-void KeepAlpha(const Frame& from, Frame& to) {
-    for (size_t i = 0; i < to.size(); ++i) {
-        to[i] = (to[i] & 0x00FFFFFF) | (from[i] & 0xFF000000);
-    }
-}
-
 } // namespace
 
 CEffect::CEffect(const Plan& plan, EffectHandle handle)
     : m_plan(plan), m_handle(handle), m_instance(*plan.effect) {
-    // A ceiling: the processor decides below it. Pictures of any size are shown whole.
-    m_instance.Context().cpuLevel = int32_t{CpuLevel_Avx2} | int32_t{CpuLevelOption_WideMap};
+    m_instance.Context().cpuLevel = kyvhosting::kPluginCpuLevel;
     m_instance.Context().width = m_instance.Context().height = 1;
     kyvhosting::Require(m_instance.Init(), *plan.effect, "InitInstance");
     const Suites& suites = GetSuites();
@@ -226,9 +211,8 @@ void CEffect::ReadValues(double time, const RectD& frame, kyvhosting::CInstance&
 // has no range. Without a rate a frame counts as a 25th of a second.
 void CEffect::SetTime(double time) {
     const CProps clip = PropsOfClip(m_clips.front());
-    double rate = clip.Double(prop::kFrameRate, 0);
-    rate = rate > 0 && std::isfinite(rate) ? rate : PropsOf(m_handle).Double(prop::kFrameRate, 25);
-    rate = rate > 0 && std::isfinite(rate) ? rate : 25;
+    const double own = PositiveOr(PropsOf(m_handle).Double(prop::kFrameRate, 25), 25);
+    const double rate = PositiveOr(clip.Double(prop::kFrameRate, 0), own);
     double first = clip.Double(prop::kFrameRange, 0, 0);
     double frames = clip.Double(prop::kFrameRange, -1, 1) - first + 1;
     if (!(frames > 0) || !std::isfinite(first)) {
@@ -236,11 +220,7 @@ void CEffect::SetTime(double time) {
         frames = PropsOf(m_handle).Double(prop::kEffectDuration, 0);
     }
     const auto units = [rate](double count) {
-        const double seconds = count / rate;
-        const bool isTime = seconds >= 0 && seconds <= kLongestSeconds;
-        // The hundredth of a unit keeps a multiple of a frame's time, which comes out of floating
-        // point slightly below itself, from counting as an earlier one.
-        return isTime ? static_cast<int64_t>(seconds * kUnitsPerSecond + 0.01) : 0;
+        return kyvhosting::TimeUnits(count / rate * kyvhosting::kUnitsPerSecond);
     };
     m_instance.Context().position = units(time - first);
     m_instance.Context().duration = units(frames);
@@ -318,8 +298,8 @@ Status CEffect::RenderImage(double time, const CProps& in, const Image& output, 
         if (status != KYV_OK) {
             return Complain(status);
         }
-        if (std::string_view(m_plan.effect->identifier) == "Kyv_Dsp_Pfx_WaterRipple") {
-            KeepAlpha(m_inputs[0], m_result);
+        if (kyvhosting::LosesAlpha(*m_plan.effect)) {
+            kyvhosting::KeepAlpha(m_inputs[0].data(), m_result.data(), m_result.size());
         }
         shown = &m_result;
     }
@@ -384,10 +364,11 @@ Status CEffect::IsIdentity(PropertySetHandle in, PropertySetHandle out) {
         isSame = percentage <= 0 || percentage >= 1;
     } else if (m_plan.effect->properties.family == EffectFamily_Color) {
         // The corrections' defaults change nothing.
-        kyvhosting::CInstance neutral(*m_plan.effect), current(*m_plan.effect);
-        isSame = neutral.Init() == KYV_OK && current.Init() == KYV_OK;
-        ReadValues(time, {0, 0, 1, 1}, current);
-        isSame = isSame && neutral.Params() == current.Params();
+        kyvhosting::CInstance values(*m_plan.effect);
+        isSame = values.Init() == KYV_OK;
+        const std::vector<uint8_t> neutral = values.Params();
+        ReadValues(time, {0, 0, 1, 1}, values);
+        isSame = isSame && values.Params() == neutral;
     } else if (m_plan.IsPictureInPicture()) {
         isSame = !IsConnected(m_clips[1]);
     }

@@ -160,10 +160,6 @@ RectI Intersection(const RectI& a, const RectI& b) {
     return {std::max(a.x1, b.x1), std::max(a.y1, b.y1), std::min(a.x2, b.x2), std::min(a.y2, b.y2)};
 }
 
-RectI Union(const RectI& a, const RectI& b) {
-    return {std::min(a.x1, b.x1), std::min(a.y1, b.y1), std::max(a.x2, b.x2), std::max(a.y2, b.y2)};
-}
-
 std::optional<Image> ImageOf(const CProps& props) {
     Image image = {};
     image.data = static_cast<uint8_t*>(props.Pointer(prop::kData));

@@ -40,7 +40,6 @@ int64_t Width(const RectI& rect);
 int64_t Height(const RectI& rect);
 bool IsEmpty(const RectI& rect);
 RectI Intersection(const RectI& a, const RectI& b);
-RectI Union(const RectI& a, const RectI& b);
 
 // The part of the image within the area as a frame of the area's size; transparent black beyond.
 void ReadImage(const Image& image, const RectI& area, Frame& frame);

@@ -6,11 +6,10 @@
 #include <memory>
 
 #include "bridges/openfx/OpenFx.h"
-#include "hosting/Module.h"
 #include "hosting/Names.h"
+#include "hosting/Plugin.h"
 #include "hosting/Text.h"
 #include "hosting/Values.h"
-#include "platform/Library.h"
 
 namespace kyvofx {
 namespace {
@@ -128,12 +127,10 @@ Plan MakePlan(const EffectDescriptor& effect) {
 const std::vector<Plan>* MakePlans() noexcept {
     try {
         auto plans = std::make_unique<std::vector<Plan>>();
-        // Kept, as the plug-in itself is: hosts unload at moments when the module may not be.
-        kyv::KeepOwnLibrary();
-        static const auto* const module = new kyvhosting::CModule(kyvhosting::FindPluginsModule(
-            {".", "..", "../../../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)}));
-        kyvhosting::UseTextsBeside(module->File());
-        const ModuleDescriptor& descriptor = module->Descriptor();
+        const kyvhosting::CModule& module = kyvhosting::PluginsModule(
+            {".", "..", "../../../../../module", kyvhosting::PathOf(KYV_MODULE_FOLDER)});
+        kyvhosting::UseTextsBeside(module.File());
+        const ModuleDescriptor& descriptor = module.Descriptor();
         for (uint32_t i = 0; i < descriptor.effectCount; ++i) {
             plans->push_back(MakePlan(descriptor.effects[i]));
         }
