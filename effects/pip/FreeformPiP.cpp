@@ -2,6 +2,7 @@
 #include "effects/pip/FreeformPiP.h"
 
 #include <algorithm>
+#include <atomic>
 
 #include "effects/pip/QuadRenderers.h"
 #include "effects/pip/SpanWalk.h"
@@ -10,6 +11,8 @@ namespace kyv {
 namespace {
 
 using KYVImageUtility::CImageARGB;
+
+std::atomic<CFreeformPiP*> g_current = nullptr;
 
 constexpr int32_t kTileSize = 1024; // columns and rows that entries address
 constexpr uint32_t kTileBits = 0x03FF03FF;
@@ -22,7 +25,18 @@ void ToFloat(const RasterPoint (&points)[4], RasterPointF (&floats)[4]) {
 
 } // namespace
 
-CFreeformPiP::CFreeformPiP() : m_pFilter(SelectResampleFilter(4, nullptr)) {}
+CFreeformPiP::CFreeformPiP() : m_pFilter(SelectResampleFilter(4, nullptr)) {
+    g_current = this;
+}
+
+CFreeformPiP::~CFreeformPiP() {
+    CFreeformPiP* self = this;
+    g_current.compare_exchange_strong(self, nullptr);
+}
+
+CFreeformPiP* CFreeformPiP::Current() {
+    return g_current;
+}
 
 void CFreeformPiP::SetSize(int32_t sourceWidth, int32_t sourceHeight, int32_t destWidth,
                            int32_t destHeight) {
@@ -96,6 +110,7 @@ bool CFreeformPiP::IsDestination(const CImageARGB& image) const {
 }
 
 int32_t CFreeformPiP::DrawOn(CImageARGB& destination) {
+    g_current = this;
     for (int32_t y = 0; y < m_nDestHeight; ++y) {
         DrawRow(y, destination.Row(y));
     }

@@ -7,7 +7,8 @@
 //
 // A wide map is told in addition which 1024 columns and rows those are, for runs of pixels.
 //
-// Drawing goes row by row, by whole spans of pixels and without any state that the process shares.
+// Drawing goes row by row, by whole spans of pixels. All that the process shares is which object is
+// the current one; drawing does not look at it.
 #pragma once
 
 #include <cstddef>
@@ -38,9 +39,10 @@ public:
         MapMode_Filtered = 4,
     };
 
-    // Inverse bilinear, bilinear, Lanczos3.
+    // Becomes the current object. Inverse bilinear, bilinear, Lanczos3.
     CFreeformPiP();
-    virtual ~CFreeformPiP() = default;
+    // An object that is current leaves none behind.
+    virtual ~CFreeformPiP();
 
     CFreeformPiP(const CFreeformPiP&) = delete;
     CFreeformPiP& operator=(const CFreeformPiP&) = delete;
@@ -92,6 +94,9 @@ public:
     // Entries by row of the frame, nine a pixel in modes 1 and 3; valid inside the quad after a
     // drawing, null before the first. Mode 4 keeps none.
     const uint32_t* SourceMap() const { return m_pSourceMap.get(); }
+
+    // The last object that was constructed or has rendered a whole image; null when that is gone.
+    static CFreeformPiP* Current();
 
 private:
     // A run of pixels whose entries address the same 1024 columns and rows of the picture.

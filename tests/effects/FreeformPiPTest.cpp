@@ -382,4 +382,24 @@ TEST(FreeformPiP, CheckerboardShowsTheMap) {
     }
 }
 
+TEST(FreeformPiP, TheLastOneConstructedIsCurrent) {
+    CFreeformPiP first;
+    EXPECT_EQ(CFreeformPiP::Current(), &first);
+    {
+        CFreeformPiP second;
+        EXPECT_EQ(CFreeformPiP::Current(), &second);
+    }
+    EXPECT_EQ(CFreeformPiP::Current(), nullptr);
+    Scene scene = {10, 10, 10, 10, {{0, 0}, {9, 0}, {9, 9}, {0, 9}}};
+    Apply(scene, first);
+    Pixels source = RandomPixels(100, 6), frame(100);
+    CImageARGB destination = View(frame, 10);
+    EXPECT_EQ(first.Render(View(source, 10), destination), 1);
+    EXPECT_EQ(CFreeformPiP::Current(), &first);
+    // The callback stays, and finds nothing to draw on.
+    const Pixels before = frame;
+    CRasterizer::PlotPixel(3, 3);
+    EXPECT_EQ(frame, before);
+}
+
 } // namespace
